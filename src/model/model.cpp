@@ -1,0 +1,3 @@
+#include "model/model.h"
+
+int model::modelcount = 0;

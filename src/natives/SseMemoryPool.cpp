@@ -1,0 +1,34 @@
+// Natives of SseMemoryPool ("ba").
+#include "natives/native.h"
+#include "util/memorymanager/memorypool.h"
+
+using namespace natives;
+
+VELMARK5_NATIVE(void) Java_ba_sa(JNIEnv* env, jobject peer, jint, jint size) {
+  frame(env, [&] {
+    toolkit& owner = current_toolkit();
+    contract::not_negative("size", size);
+    auto pool = std::make_unique<memorypool>(owner, peer, static_cast<unsigned int>(size));
+    objconvert::set_memorypool(env, peer, pool.release());
+  });
+}
+
+VELMARK5_NATIVE(void) Java_ba_ma(JNIEnv* env, jobject peer) {
+  frame(env, [&] {
+    // Only the storage goes: the weak reference to the peer stays until the process ends.
+    if (memorymanager* pool = objconvert::get_memorypool(env, peer); pool != nullptr) {
+      pool->~memorymanager();
+      ::operator delete(pool);
+    }
+    objconvert::set_memorypool(env, peer, nullptr);
+  });
+}
+
+VELMARK5_NATIVE(void) Java_ba_ha(JNIEnv* env, jobject peer) {
+  frame(env, [&] {
+    contract::object(objconvert::get_memorypool(env, peer)).release_resources();
+    objconvert::set_memorypool(env, peer, nullptr);
+  });
+}
+
+VELMARK5_NATIVE(void) Java_ba_u(JNIEnv*, jobject) {}

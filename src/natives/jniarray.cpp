@@ -1,0 +1,3 @@
+#include "natives/jniarray.h"
+
+std::atomic<int> pin_count{0};

@@ -1,0 +1,40 @@
+// The clip rectangle.
+#include <algorithm>
+
+#include "raster/Rasterizer.h"
+#include "toolkit/toolkit.h"
+
+void toolkit::resetclipping() {
+  clip_x0 = 0;
+  clip_y0 = 0;
+  clip_x1 = width;
+  clip_y1 = height;
+  updateClippingDerived();
+}
+
+void toolkit::setclipping(int x0, int y0, int x1, int y1) {
+  clip_x0 = std::max(x0, 0);
+  clip_y0 = std::max(y0, 0);
+  clip_x1 = std::min(x1, width);
+  clip_y1 = std::min(y1, height);
+  updateClippingDerived();
+}
+
+void toolkit::setsubclipping(int x0, int y0, int x1, int y1) {
+  clip_x0 = std::max(x0, clip_x0);
+  clip_y0 = std::max(y0, clip_y0);
+  clip_x1 = std::min(x1, clip_x1);
+  clip_y1 = std::min(y1, clip_y1);
+  updateClippingDerived();
+}
+
+void toolkit::getclipping(int* out) const {
+  out[0] = clip_x0;
+  out[1] = clip_y0;
+  out[2] = clip_x1;
+  out[3] = clip_y1;
+}
+
+void toolkit::updateClippingDerived() {
+  Rasterizer_n::SetCliprect({clip_x0, clip_y0, clip_x1 - clip_x0, clip_y1 - clip_y0});
+}
