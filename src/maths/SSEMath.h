@@ -44,6 +44,7 @@ VELMARK5_LANE Float4 max(Float4 a, Float4 b) { return {_mm_max_ps(a.v, b.v)}; }
 VELMARK5_LANE Float4 min(Float4 a, Float4 b) { return {_mm_min_ps(a.v, b.v)}; }
 VELMARK5_LANE Float4 reciprocal_estimate(Float4 a) { return {_mm_rcp_ps(a.v)}; }
 VELMARK5_LANE Float4 reciprocal_root_estimate(Float4 a) { return {_mm_rsqrt_ps(a.v)}; }
+VELMARK5_LANE Int4 less(Float4 a, Float4 b) { return {_mm_castps_si128(_mm_cmplt_ps(a.v, b.v))}; }
 VELMARK5_LANE Int4 less_equal(Float4 a, Float4 b) { return {_mm_castps_si128(_mm_cmple_ps(a.v, b.v))}; }
 
 // Picks lanes by number, the first for lane 0.
@@ -104,6 +105,10 @@ VELMARK5_LANE Word8 shift_left(Word8 a) {
   return {_mm_slli_epi16(a.v, Bits)};
 }
 VELMARK5_LANE Word8 add_saturating(Word8 a, Word8 b) { return {_mm_adds_epu16(a.v, b.v)}; }
+
+// The same register seen as the other type.
+VELMARK5_LANE Word8 words(Int4 a) { return {a.v}; }
+VELMARK5_LANE Int4 pixels(Word8 a) { return {a.v}; }
 
 // The channels of pixels 0 and 1, and of 2 and 3, as bytes widened to 16 bits.
 VELMARK5_LANE Word8 widen_low(Int4 pixels) { return {_mm_unpacklo_epi8(pixels.v, _mm_setzero_si128())}; }
