@@ -1,0 +1,116 @@
+// A Java runtime of the tests' own: objects, arrays, exceptions and callbacks behind a JNIEnv that watches its caller.
+//
+// Arrays are handed out as copies at the odd alignment that a real runtime may give, so that a missing release, a write
+// through a read-only view and a write past the end all show. Recorded as violations: any call but a critical one while
+// an array is pinned; a call with a pending exception that JNI forbids then; a second or wrong release; a null where an
+// object must be. verify() turns them, and whatever was not given back, into test failures.
+//
+// JNI functions that the library has no business with end the program.
+#pragma once
+
+#include <jni.h>
+
+#include <deque>
+#include <functional>
+#include <map>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+struct fake_object;
+struct fake_env;
+
+class fake_java {
+ public:
+  fake_java();
+  ~fake_java();
+  fake_java(const fake_java&) = delete;
+  fake_java& operator=(const fake_java&) = delete;
+
+  // The calling thread's environment, attached when it is first asked for.
+  JNIEnv* env();
+  operator JNIEnv*() { return env(); }
+
+  // --- Objects --------------------------------------------------------------------------------------------------
+
+  jobject new_object(const char* class_name);
+  jlong nativeid(jobject object) const;
+  void set_nativeid(jobject object, jlong value);
+
+  jintArray new_ints(const std::vector<jint>& values);
+  jshortArray new_shorts(const std::vector<jshort>& values);
+  jbyteArray new_bytes(const std::vector<jbyte>& values);
+  jbooleanArray new_booleans(const std::vector<jboolean>& values);
+  jfloatArray new_floats(const std::vector<jfloat>& values);
+  jobjectArray new_objects(const std::vector<jobject>& values);
+
+  std::vector<jint> ints(jintArray array) const;
+  std::vector<jshort> shorts(jshortArray array) const;
+  std::vector<jbyte> bytes(jbyteArray array) const;
+  std::vector<jboolean> booleans(jbooleanArray array) const;
+  std::vector<jfloat> floats(jfloatArray array) const;
+
+  // --- The client's callbacks, on class "ja"; unset ones answer false and null ------------------------------------
+
+  std::function<jboolean(jshort)> request_texture;  // SA
+  std::function<void()> garbagecollect;             // h
+  std::function<jobject()> createshadow;            // WA
+
+  // --- Exceptions of the calling thread ---------------------------------------------------------------------------
+
+  // What Throwable.toString() gives of the pending exception, which is cleared: "java.lang.Error: text", or just the
+  // class where the message is null. "" when there is none.
+  std::string take_exception();
+  void raise(const char* class_name, const char* message);  // as a callback would
+
+  // --- What was seen ------------------------------------------------------------------------------------------------
+
+  // Reports as test failures, and forgets: violations, arrays not given back, monitors held, a pending exception.
+  void verify();
+  std::vector<std::string> take_violations();
+
+  int calls(const std::string& function) const;  // since the start, over all threads
+  const std::vector<std::string>& log() const { return history; }
+  void clear_log() { history.clear(); }
+  int weak_references() const { return live_weak; }
+  int arrays_out() const;  // handed out, not given back
+
+  // Makes Get<Type>ArrayElements and GetPrimitiveArrayCritical number `n` from now answer null with an
+  // OutOfMemoryError pending; 0 for none.
+  void fail_array_access(int n) { array_access_failure = n; }
+
+ private:
+  friend struct fake_calls;
+
+  struct handed_out {
+    fake_object* array;
+    std::unique_ptr<unsigned char[]> storage;
+    bool critical;
+    JNIEnv* owner;
+  };
+
+  void violation(const std::string& text);
+  fake_object* make(const std::string& class_name);
+  template <class Array, class T>
+  Array make_array(const char* class_name, const std::vector<T>& values);
+  void enter(JNIEnv* caller, const char* function, bool legal_with_exception = false, bool legal_when_pinned = false);
+  void* hand_out(JNIEnv* caller, jobject array, bool critical, const char* type);
+  void give_back(JNIEnv* caller, jobject array, void* elements, jint mode, bool critical);
+  void throw_object(JNIEnv* caller, fake_object* exception);
+
+  mutable std::recursive_mutex lock;
+  JNIInvokeInterface_ vm_functions{};
+  JavaVM vm{};
+  std::map<std::thread::id, std::unique_ptr<fake_env>> environments;
+  std::deque<std::unique_ptr<fake_object>> objects;
+  std::map<std::string, fake_object*> classes;
+  std::map<void*, handed_out> out;
+  std::map<std::string, int> call_counts;
+  std::vector<std::string> history;
+  std::vector<std::string> violations;
+  int live_weak = 0;
+  int monitors = 0;
+  int array_access_failure = 0;
+};
