@@ -1,0 +1,46 @@
+// The glyph store of a font: bitmaps and metrics in a pool, one entry per glyph.
+#pragma once
+
+#include "toolkit/glyph.h"
+#include "util/memorymanager/sharedarray.h"
+#include "util/memorymanager/simplearray.h"
+
+using glyph_bitmaps = simplearray<sharedarray<unsigned char>>;
+
+// Pixels, per glyph. Any array may be missing.
+struct font_metrics {
+  sharedarray<int> widths;
+  sharedarray<int> heights;
+  sharedarray<int> y_offsets;  // added to the pen's y
+  sharedarray<int> x_offsets;  // added to the pen's x
+};
+
+// The glyph's bitmap; without bytes when the index is out of range, or the bitmap or a size is missing or too short.
+inline glyph::bitmap glyph_bitmap(const glyph_bitmaps& glyphs, const font_metrics& metrics, short glyph) {
+  const int i = glyph;
+  if (i < 0 || i >= glyphs.count || i >= metrics.widths.count() || i >= metrics.heights.count()) return {};
+  const int width = metrics.widths[i];
+  const int height = metrics.heights[i];
+  if (width < 1 || height < 1 || glyphs[i].count() < static_cast<long long>(width) * height) return {};
+  return {glyphs[i].data(), width, height};
+}
+
+// Draws the glyph upright with the pen at (x, y), through a mask if there is one.
+template <class Ink>
+void plot_upright(const glyph_bitmaps& glyphs, const font_metrics& metrics, short glyph, int x, int y, const Ink& ink,
+                  const clippingmask* mask = nullptr, int mask_x = 0, int mask_y = 0) {
+  const glyph::bitmap bitmap = glyph_bitmap(glyphs, metrics, glyph);
+  if (bitmap.bytes == nullptr || glyph >= metrics.x_offsets.count() || glyph >= metrics.y_offsets.count()) return;
+  const long long px = static_cast<long long>(x) + metrics.x_offsets[glyph];
+  const long long py = static_cast<long long>(y) + metrics.y_offsets[glyph];
+  glyph::draw(*toolkit::m_pInstance, px, py, bitmap.width, bitmap.height, ink, glyph::upright_rows(bitmap), mask,
+              mask_x, mask_y);
+}
+
+// Draws the glyph turned a quarter counter-clockwise; (x, y) is the top left of the turned box.
+template <class Ink>
+void plot_upwards(const glyph_bitmaps& glyphs, const font_metrics& metrics, short glyph, int x, int y, const Ink& ink) {
+  const glyph::bitmap bitmap = glyph_bitmap(glyphs, metrics, glyph);
+  if (bitmap.bytes == nullptr) return;
+  glyph::draw(*toolkit::m_pInstance, x, y, bitmap.height, bitmap.width, ink, glyph::upward_rows(bitmap));
+}
