@@ -1,5 +1,5 @@
 // Natives of SseFontAlpha ("ea").
-#include "natives/font_loading.h"
+#include "natives/font_natives.h"
 #include "toolkit/font_alpha.h"
 
 using namespace natives;
@@ -10,40 +10,27 @@ Java_ea_n(JNIEnv* env, jobject peer, jint, jobject pool, jobjectArray glyphs, ji
   frame(env, [&] {
     memorymanager& memory = contract::object(objconvert::get_memorypool(env, pool));
     contract::not_null(glyphs);
-    const font_loading::arguments from{glyphs, widths, heights, y_offsets, x_offsets};
-    font_loading::check(env, from, font_loading::no_palette);
+    const font_natives::arguments from{glyphs, widths, heights, y_offsets, x_offsets};
+    font_natives::check(env, from, font_natives::no_palette);
     auto font = std::make_unique<font_alpha>(&memory);
-    font_loading::load_metrics(env, &memory, from, font->metrics);
-    font_loading::load_glyphs(env, &memory, glyphs, font->glyphs);
+    font_natives::load_metrics(env, &memory, from, font->metrics);
+    font_natives::load_glyphs(env, &memory, glyphs, font->glyphs);
     objconvert::set_font_alpha(env, peer, font.release());
   });
 }
 
 VELMARK5_NATIVE(void) Java_ea_UA(JNIEnv* env, jobject peer, jchar glyph, jint x, jint y, jint colour, jboolean solid) {
-  frame(env, [&] {
-    current_toolkit();
-    contract::object(objconvert::get_font_alpha(env, peer))
-        .plotletter(static_cast<short>(glyph), x, y, static_cast<unsigned int>(colour), is_true(solid));
-  });
+  font_natives::plot(env, objconvert::get_font_alpha, peer, glyph, x, y, colour, solid);
 }
 
 VELMARK5_NATIVE(void)
 Java_ea_P(JNIEnv* env, jobject peer, jchar glyph, jint x, jint y, jint colour, jboolean solid, jobject mask,
           jint mask_x, jint mask_y) {
-  frame(env, [&] {
-    current_toolkit();
-    const font_alpha& font = contract::object(objconvert::get_font_alpha(env, peer));
-    font.plotletter(static_cast<short>(glyph), x, y, static_cast<unsigned int>(colour), is_true(solid),
-                    objconvert::get_clippingmask(env, mask), mask_x, mask_y);
-  });
+  font_natives::plot_masked(env, objconvert::get_font_alpha, peer, glyph, x, y, colour, solid, mask, mask_x, mask_y);
 }
 
 VELMARK5_NATIVE(void) Java_ea_f(JNIEnv* env, jobject peer, jchar glyph, jint x, jint y, jint colour, jboolean solid) {
-  frame(env, [&] {
-    current_toolkit();
-    contract::object(objconvert::get_font_alpha(env, peer))
-        .plotletter_upwards(static_cast<short>(glyph), x, y, static_cast<unsigned int>(colour), is_true(solid));
-  });
+  font_natives::plot_upwards(env, objconvert::get_font_alpha, peer, glyph, x, y, colour, solid);
 }
 
 VELMARK5_NATIVE(void) Java_ea_ma(JNIEnv* env, jobject peer) {

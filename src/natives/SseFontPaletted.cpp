@@ -1,5 +1,5 @@
 // Natives of SseFontPaletted ("ia").
-#include "natives/font_loading.h"
+#include "natives/font_natives.h"
 #include "toolkit/font_paletted.h"
 
 using namespace natives;
@@ -10,41 +10,28 @@ Java_ia_EA(JNIEnv* env, jobject peer, jint, jobject pool, jobjectArray glyphs, j
   frame(env, [&] {
     memorymanager& memory = contract::object(objconvert::get_memorypool(env, pool));
     contract::not_null(glyphs);
-    const font_loading::arguments from{glyphs, widths, heights, y_offsets, x_offsets};
-    font_loading::check(env, from, palette != nullptr ? array_length(env, palette) : font_loading::no_palette);
+    const font_natives::arguments from{glyphs, widths, heights, y_offsets, x_offsets};
+    font_natives::check(env, from, palette != nullptr ? array_length(env, palette) : font_natives::no_palette);
     auto font = std::make_unique<font_paletted>(&memory);
     font->palette = copied_jintArrayRO(env, palette).toSharedarray<unsigned int>(&memory);
-    font_loading::load_metrics(env, &memory, from, font->metrics);
-    font_loading::load_glyphs(env, &memory, glyphs, font->glyphs);
+    font_natives::load_metrics(env, &memory, from, font->metrics);
+    font_natives::load_glyphs(env, &memory, glyphs, font->glyphs);
     objconvert::set_font_paletted(env, peer, font.release());
   });
 }
 
 VELMARK5_NATIVE(void) Java_ia_UA(JNIEnv* env, jobject peer, jchar glyph, jint x, jint y, jint colour, jboolean solid) {
-  frame(env, [&] {
-    current_toolkit();
-    contract::object(objconvert::get_font_paletted(env, peer))
-        .plotletter(static_cast<short>(glyph), x, y, static_cast<unsigned int>(colour), is_true(solid));
-  });
+  font_natives::plot(env, objconvert::get_font_paletted, peer, glyph, x, y, colour, solid);
 }
 
 VELMARK5_NATIVE(void)
 Java_ia_GA(JNIEnv* env, jobject peer, jchar glyph, jint x, jint y, jint colour, jboolean solid, jobject mask,
            jint mask_x, jint mask_y) {
-  frame(env, [&] {
-    current_toolkit();
-    const font_paletted& font = contract::object(objconvert::get_font_paletted(env, peer));
-    font.plotletter(static_cast<short>(glyph), x, y, static_cast<unsigned int>(colour), is_true(solid),
-                    objconvert::get_clippingmask(env, mask), mask_x, mask_y);
-  });
+  font_natives::plot_masked(env, objconvert::get_font_paletted, peer, glyph, x, y, colour, solid, mask, mask_x, mask_y);
 }
 
 VELMARK5_NATIVE(void) Java_ia_f(JNIEnv* env, jobject peer, jchar glyph, jint x, jint y, jint colour, jboolean solid) {
-  frame(env, [&] {
-    current_toolkit();
-    contract::object(objconvert::get_font_paletted(env, peer))
-        .plotletter_upwards(static_cast<short>(glyph), x, y, static_cast<unsigned int>(colour), is_true(solid));
-  });
+  font_natives::plot_upwards(env, objconvert::get_font_paletted, peer, glyph, x, y, colour, solid);
 }
 
 VELMARK5_NATIVE(void) Java_ia_ma(JNIEnv* env, jobject peer) {

@@ -1,9 +1,9 @@
-#include "natives/font_loading.h"
+#include "natives/font_natives.h"
 
 #include <algorithm>
 #include <cstring>
 
-namespace font_loading {
+namespace font_natives {
 
 namespace {
 
@@ -72,4 +72,4 @@ void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, glyph_bitm
   }
 }
 
-}  // namespace font_loading
+}  // namespace font_natives
