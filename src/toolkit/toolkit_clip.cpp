@@ -36,5 +36,9 @@ void toolkit::getclipping(int* out) const {
 }
 
 void toolkit::updateClippingDerived() {
-  Rasterizer_n::SetCliprect({clip_x0, clip_y0, clip_x1 - clip_x0, clip_y1 - clip_y0});
+  // An empty rectangle may have any corners, and its extents wrap.
+  const auto extent = [](int from, int to) {
+    return static_cast<int>(static_cast<unsigned int>(to) - static_cast<unsigned int>(from));
+  };
+  Rasterizer_n::SetCliprect({clip_x0, clip_y0, extent(clip_x0, clip_x1), extent(clip_y0, clip_y1)});
 }
