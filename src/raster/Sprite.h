@@ -16,8 +16,9 @@ struct Sprite_c {
   Sprite_c(const Sprite_c&) = delete;
   Sprite_c& operator=(const Sprite_c&) = delete;
 
-  int full_width() const { return left + width + right; }
-  int full_height() const { return top + height + bottom; }
+  // With the margins. Margins of any value are legal, so the sums wrap.
+  int full_width() const { return wrapping_sum(left, width, right); }
+  int full_height() const { return wrapping_sum(top, height, bottom); }
 
   // Replaces the pixels by an undefined block of width by height; the margins stay. Throws RuntimeException*.
   void Allocate(unsigned int width, unsigned int height);
@@ -39,4 +40,9 @@ struct Sprite_c {
   // the alpha byte of each pixel. stride is the row stride of both arrays in elements.
   void CopyFrom8Bit(const unsigned char* indices, const unsigned int* palette, const unsigned char* alpha,
                     unsigned int stride);
+
+ private:
+  static int wrapping_sum(int a, int b, int c) {
+    return static_cast<int>(static_cast<unsigned int>(a) + static_cast<unsigned int>(b) + static_cast<unsigned int>(c));
+  }
 };
