@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cstdarg>
 #include <cstdio>
+#include <limits>
 #include <string>
 
 namespace contract {
@@ -69,6 +70,15 @@ void rows_inside(const char* name, int length, int offset, int stride, int w, in
   if (lowest < 0 || highest > length) {
     fail_array("%s: length %d, but offset %d, stride %d and %dx%d reach from %lld to %lld", name, length, offset,
                stride, w, h, lowest, highest);
+  }
+}
+
+void image_size(int width, int height) {
+  not_negative("width", width);
+  not_negative("height", height);
+  constexpr long long most = std::numeric_limits<int>::max() / 4;
+  if (checked && static_cast<long long>(width) * height > most) {
+    fail_argument("size: %dx%d is more than %lld pixels", width, height, most);
   }
 }
 

@@ -51,4 +51,7 @@ void rectangle_inside(const char* name, int x, int y, int w, int h, int width, i
 // starting at `offset`.
 void rows_inside(const char* name, int length, int offset, int stride, int w, int h);
 
+// The size of a new image or depth image: neither is negative, and the bytes can be counted in an int.
+void image_size(int width, int height);
+
 }  // namespace contract
