@@ -1,0 +1,87 @@
+package velmark5;
+
+/**
+ * An image of 0xAARRGGBB pixels: something to draw, and a target to draw to. Its full size is the stored pixels plus the
+ * {@linkplain #margins() margins} that were trimmed.
+ */
+public interface Sprite extends AutoCloseable {
+  /**
+   * Stored columns.
+   *
+   * @return the width without margins
+   */
+  int width();
+
+  /**
+   * Stored rows.
+   *
+   * @return the height without margins
+   */
+  int height();
+
+  /**
+   * Columns of the whole image.
+   *
+   * @return the width with margins
+   */
+  int fullWidth();
+
+  /**
+   * Rows of the whole image.
+   *
+   * @return the height with margins
+   */
+  int fullHeight();
+
+  /**
+   * The margins, none at first.
+   *
+   * @return how much was trimmed at each edge
+   */
+  Margins margins();
+
+  /**
+   * Sets the margins. The stored pixels stay.
+   *
+   * @param margins how much was trimmed at each edge
+   */
+  void setMargins(Margins margins);
+
+  /**
+   * Replaces pixels, alpha included.
+   *
+   * @param area the part of the stored pixels to replace, inside them
+   * @param pixels the new words, row after row
+   * @param offset index of the first word
+   * @param stride words from one row to the next
+   * @throws IllegalArgumentException if the area is not inside the stored pixels
+   * @throws ArrayIndexOutOfBoundsException if the array is too short
+   */
+  void write(Rect area, int[] pixels, int offset, int stride);
+
+  /**
+   * Takes pixels from the frame that the toolkit draws to. Words of 0 stay 0, all others become opaque.
+   *
+   * @param area the part of the stored pixels to replace, inside them
+   * @param frameX left edge of the part of the frame, which must lie inside it
+   * @param frameY top edge of the part of the frame
+   * @throws IllegalArgumentException if a rectangle is outside the sprite or the frame
+   * @throws IllegalStateException if the toolkit draws to no frame
+   */
+  void capture(Rect area, int frameX, int frameY);
+
+  /**
+   * Takes the alpha of all stored pixels from the frame that the toolkit draws to; red, green and blue stay.
+   *
+   * @param frameX left edge of the part of the frame, of the sprite's size
+   * @param frameY top edge of the part of the frame
+   * @param channel which byte becomes the alpha
+   * @throws IllegalArgumentException if the part is outside the frame
+   * @throws IllegalStateException if the toolkit draws to no frame
+   */
+  void captureAlpha(int frameX, int frameY, Channel channel);
+
+  /** Gives the pixels back. If the sprite is the target, the toolkit draws to nothing from then on. */
+  @Override
+  void close();
+}

@@ -1,0 +1,116 @@
+import java.util.Objects;
+import velmark5.Channel;
+import velmark5.Margins;
+import velmark5.Rect;
+import velmark5.Sprite;
+
+/** Sprite. */
+final class fa extends Peer implements Sprite {
+  long nativeid;
+
+  native void UA(int unused, int w, int h);
+
+  native void K(int unused, int x, int y, int w, int h, boolean opaque) throws Exception;
+
+  native void RA(int unused, int[] pixels, int unusedOffset, int stride, int w, int h, boolean opaque);
+
+  native void EA(
+      int unused, int[] palette, byte[] indices, byte[] alpha, int unusedOffset, int stride, int w, int h);
+
+  native void M(long handle);
+
+  native int da(long handle);
+
+  native int GA(long handle);
+
+  native int WA(long handle);
+
+  native int ba(long handle);
+
+  native void U(long handle, int left, int top, int right, int bottom);
+
+  native void F(long handle, int[] result);
+
+  native void na(long handle, int x, int y, int w, int h, int[] pixels, int offset, int stride);
+
+  native void ea(long handle, int x, int y, int w, int h, int fbx, int fby) throws Exception;
+
+  native void j(long handle, int fbx, int fby, int channel) throws Exception;
+
+  /** A peer with no native object yet; one of the natives above gives it one. */
+  fa(ja toolkit) {
+    super(toolkit);
+  }
+
+  @Override
+  long id() {
+    return nativeid;
+  }
+
+  @Override
+  String name() {
+    return "sprite";
+  }
+
+  @Override
+  void destroy() {
+    toolkit.leaveTarget(this);
+    M(nativeid);
+  }
+
+  @Override
+  public int width() {
+    return da(handle());
+  }
+
+  @Override
+  public int height() {
+    return GA(handle());
+  }
+
+  @Override
+  public int fullWidth() {
+    return WA(handle());
+  }
+
+  @Override
+  public int fullHeight() {
+    return ba(handle());
+  }
+
+  @Override
+  public Margins margins() {
+    int[] result = new int[4];
+    F(handle(), result);
+    return new Margins(result[0], result[1], result[2], result[3]);
+  }
+
+  @Override
+  public void setMargins(Margins margins) {
+    U(handle(), margins.left(), margins.top(), margins.right(), margins.bottom());
+  }
+
+  @Override
+  public void write(Rect area, int[] pixels, int offset, int stride) {
+    Objects.requireNonNull(pixels, "pixels");
+    na(handle(), area.x(), area.y(), area.width(), area.height(), pixels, offset, stride);
+  }
+
+  @Override
+  public void capture(Rect area, int frameX, int frameY) {
+    try {
+      ea(handle(), area.x(), area.y(), area.width(), area.height(), frameX, frameY);
+    } catch (Exception e) {
+      throw translated(e);
+    }
+  }
+
+  @Override
+  public void captureAlpha(int frameX, int frameY, Channel channel) {
+    try {
+      j(handle(), frameX, frameY, channel.code());
+    } catch (Exception e) {
+      throw translated(e);
+    }
+  }
+}
