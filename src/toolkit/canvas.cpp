@@ -136,7 +136,7 @@ canvas::canvas(JavaVM* machine, jobject component, int w, int h, const display_b
 
 canvas::~canvas() {
   free_backbuffer();
-  get_env()->DeleteWeakGlobalRef(java_canvas);
+  if (java_canvas != nullptr) get_env()->DeleteWeakGlobalRef(java_canvas);
   java_canvas = nullptr;
 }
 
@@ -149,7 +149,7 @@ JNIEnv* canvas::get_env() const {
 void canvas::resized(jobject component, int w, int h) {
   free_backbuffer();
   JNIEnv* env = get_env();
-  env->DeleteWeakGlobalRef(java_canvas);
+  if (java_canvas != nullptr) env->DeleteWeakGlobalRef(java_canvas);
   java_canvas = env->NewWeakGlobalRef(component);
   if (java_canvas == nullptr) throw new JavaExceptionPending;
   create_backbuffer(w, h);
@@ -192,22 +192,8 @@ bool canvas::create_shared_images() {
   error_trap trap(binding, display);
   int made = 0;
   bool attached = true;
-  for (int i = 0; i < 2 && attached; ++i) {
-    XImage* const fresh = binding.XShmCreateImage(display, ScreenOfDisplay(display, 0)->root_visual, image_depth,
-                                                  ZPixmap, nullptr, x_segment(shm[i]), width, height);
-    if (fresh == nullptr) break;
-    image[i] = fresh;
-    shm[i].shmid = binding.shmget(IPC_PRIVATE, buffer_size(width, height), create_for_all);
-    void* const address = shm[i].shmid != -1 ? binding.shmat(shm[i].shmid, nullptr, 0) : reinterpret_cast<void*>(-1);
-    if (address == reinterpret_cast<void*>(-1)) {
-      if (shm[i].shmid != -1) binding.shmctl(shm[i].shmid, IPC_RMID, nullptr);
-      XDestroyImage(fresh);
-      image[i] = nullptr;
-      break;
-    }
-    shm[i].shmaddr = fresh->data = static_cast<char*>(address);
-    shm[i].readOnly = False;
-    attached = binding.XShmAttach(display, x_segment(shm[i])) != 0;
+  while (made < 2 && attached && map_shared_image(made)) {
+    attached = binding.XShmAttach(display, x_segment(shm[made])) != 0;
     ++made;
   }
   attached = trap.all_well() && attached;
@@ -223,6 +209,28 @@ bool canvas::create_shared_images() {
   for (int i = 0; i < made; ++i) release_shared_image(i);
   trap.all_well();
   return false;
+}
+
+// An image in shared memory, our side only.
+bool canvas::map_shared_image(int i) {
+  XImage* const fresh = binding.XShmCreateImage(display, ScreenOfDisplay(display, 0)->root_visual, image_depth, ZPixmap,
+                                                nullptr, x_segment(shm[i]), width, height);
+  if (fresh == nullptr) return false;
+  void* const nowhere = reinterpret_cast<void*>(-1);
+  void* address = nowhere;
+  shm[i].shmid = binding.shmget(IPC_PRIVATE, buffer_size(width, height), create_for_all);
+  if (shm[i].shmid != -1) {
+    address = binding.shmat(shm[i].shmid, nullptr, 0);
+    if (address == nowhere) binding.shmctl(shm[i].shmid, IPC_RMID, nullptr);
+  }
+  if (address == nowhere) {
+    XDestroyImage(fresh);
+    return false;
+  }
+  image[i] = fresh;
+  shm[i].shmaddr = fresh->data = static_cast<char*>(address);
+  shm[i].readOnly = False;
+  return true;
 }
 
 void canvas::create_local_image() {

@@ -60,6 +60,7 @@ class canvas {
  private:
   void create_backbuffer(int new_width, int new_height);
   bool create_shared_images();
+  bool map_shared_image(int i);
   void create_local_image();
   void release_shared_image(int i);
   void free_backbuffer();

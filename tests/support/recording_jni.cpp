@@ -146,13 +146,16 @@ struct fake_calls {
   }
   static void JNICALL DeleteWeakGlobalRef(JNIEnv* env, jweak reference) {
     java(env).enter(env, "DeleteWeakGlobalRef", true);
-    if (!present(env, reference, "DeleteWeakGlobalRef")) return;
-    if (of(reference)->class_name != "weak") {
-      java(env).violation("DeleteWeakGlobalRef of something else");
+    if (reference == nullptr || of(reference)->class_name != "weak") {
+      java(env).violation("DeleteWeakGlobalRef of no weak reference");
       return;
     }
     of(reference)->class_name = "deleted weak reference";
     --java(env).live_weak;
+  }
+  static jobject JNICALL NewLocalRef(JNIEnv* env, jobject reference) {
+    java(env).enter(env, "NewLocalRef");
+    return reference == nullptr ? nullptr : as(strong(of(reference)));
   }
   static void JNICALL DeleteLocalRef(JNIEnv* env, jobject) { java(env).enter(env, "DeleteLocalRef", true); }
   static jsize JNICALL GetArrayLength(JNIEnv* env, jarray array) {
@@ -272,6 +275,7 @@ struct fake_calls {
       VELMARK5_SET(GetJavaVM), VELMARK5_SET(FindClass), VELMARK5_SET(GetObjectClass), VELMARK5_SET(GetFieldID);
       VELMARK5_SET(GetMethodID), VELMARK5_SET(GetLongField), VELMARK5_SET(SetLongField);
       VELMARK5_SET(NewWeakGlobalRef), VELMARK5_SET(DeleteWeakGlobalRef), VELMARK5_SET(DeleteLocalRef);
+      VELMARK5_SET(NewLocalRef);
       VELMARK5_SET(GetArrayLength), VELMARK5_SET(GetObjectArrayElement), VELMARK5_SET(NewIntArray);
       VELMARK5_SET(ThrowNew), VELMARK5_SET(Throw), VELMARK5_SET(ExceptionCheck), VELMARK5_SET(NewObjectV);
       VELMARK5_SET(CallVoidMethodV), VELMARK5_SET(CallBooleanMethodV), VELMARK5_SET(CallObjectMethodV);
@@ -335,6 +339,13 @@ JNIEnv* fake_java::env() {
     found->java = this;
   }
   return &found->jni;
+}
+
+void fake_java::collect(jobject object) {
+  const std::lock_guard guard(lock);
+  for (const auto& other : objects) {
+    if (other->class_name == "weak" && other->target == of(object)) other->target = nullptr;
+  }
 }
 
 fake_object* fake_java::make(const std::string& class_name) {

@@ -38,6 +38,7 @@ class fake_java {
   jobject new_object(const char* class_name);
   jlong nativeid(jobject object) const;
   void set_nativeid(jobject object, jlong value);
+  void collect(jobject object);  // clears the weak references to it, as the garbage collector does
 
   jintArray new_ints(const std::vector<jint>& values);
   jshortArray new_shorts(const std::vector<jshort>& values);
