@@ -1,6 +1,6 @@
 #include "maths/Matrix.h"
 
-#include <xmmintrin.h>
+#include "maths/SSEMath.h"
 
 constinit const Matrix_c Matrix_c::IdentityRows{{{1, 0, 0, 0}, {0, 1, 0, 0}, {0, 0, 1, 0}, {0, 0, 0, 1}}};
 constinit const Vector4_s Matrix_c::NegateX{-1, 1, 1, 1};
@@ -9,6 +9,18 @@ constinit const Vector4_s Matrix_c::NegateZ{1, 1, -1, 1};
 constinit const Vector4_s Matrix_c::OneOneOneZero{1, 1, 1, 0};
 constinit const std::uint32_t Matrix_c::XYZMask[4] = {0xFFFFFFFF, 0xFFFFFFFF, 0xFFFFFFFF, 0};
 constinit const std::uint32_t Matrix_c::ZSignMask[4] = {0, 0, 0x80000000, 0};
+
+Matrix_c Matrix_c::Multiply(const Matrix_c& a, const Matrix_c& b) {
+  using namespace SSEMath;
+  const auto row = [&b](int i) { return load(&b.rows[i].x); };
+  Matrix_c product;
+  for (int i = 0; i < 4; ++i) {
+    const Vector4_s& left = a.rows[i];
+    store(&product.rows[i].x,
+          (splat(left.x) * row(0) + splat(left.z) * row(2)) + (splat(left.y) * row(1) + splat(left.w) * row(3)));
+  }
+  return product;
+}
 
 void Matrix_c::ExtractFrustumPlanes(const Matrix_c& matrix, Vector4_s planes[6]) {
   // The planes are sums and differences of columns.

@@ -7,7 +7,7 @@
 #include <cstdint>
 #include <utility>
 
-#include "raster/Rasterizer.h"
+#include "raster/Projection.h"
 #include "toolkit/clippingmask.h"
 #include "toolkit/primitive_blend.h"
 #include "toolkit/toolkit.h"
@@ -141,27 +141,11 @@ void toolkit::line(int x0, int y0, int x1, int y1, unsigned int colour, unsigned
 }
 
 void toolkit::line(int x0, int y0, int z0, int, int, int, unsigned int colour, unsigned int mode) {
-  using namespace SSEMath;
-  const auto row = [this](int i) { return load(&viewprojection.rows[i].x); };
-  const Float4 point = row(0) * splat(static_cast<float>(x0)) + row(1) * splat(static_cast<float>(y0)) +
-                       row(2) * splat(static_cast<float>(z0)) + row(3);
-  // A point behind the eye keeps its negative depth, though w is negative too.
-  const Int4 sign = Int4{_mm_castps_si128(point.v)} & load(Matrix_c::ZSignMask);
-  const Float4 divided{_mm_div_ps(point.v, broadcast<3>(point).v)};
-  const Float4 projected{_mm_or_ps(divided.v, _mm_castsi128_ps(sign.v))};
-  const Float4 screen = projected * load(&Rasterizer_n::m_ViewportMul.x) + load(&Rasterizer_n::m_ViewportAdd.x);
-
-  // Rounded to 16 bits: x, y, depth, depth.
-  const Float4 scaled = shuffle<0, 1, 2, 2>(screen) * floats(1, 1, 32767, 32767);
-  const __m128i rounded = _mm_cvtps_epi32(scaled.v);
-  const __m128i lanes = _mm_packs_epi32(rounded, rounded);
-  const __m128i culler = _mm_load_si128(reinterpret_cast<const __m128i*>(Rasterizer_n::m_TriangleCuller.lanes));
-  const __m128i past = _mm_cmpgt_epi16(lanes, culler);
-  const __m128i before = _mm_cmpgt_epi16(_mm_setzero_si128(), lanes);
-  // Visible: the depth is past the near bound (lane 3), and nothing else is past or before.
-  const int flags = _mm_movemask_epi8(_mm_packs_epi16(_mm_unpacklo_epi64(past, before), _mm_setzero_si128()));
-  if (flags != 1 << 3) return;
-  const int x = static_cast<std::int16_t>(_mm_extract_epi16(lanes, 0));
-  const int y = static_cast<std::int16_t>(_mm_extract_epi16(lanes, 1));
+  using namespace Rasterizer_n;
+  const SSEMath::Word8 packed = PackForCulling<true>(
+      ToScreen(Transform(viewprojection, static_cast<float>(x0), static_cast<float>(y0), static_cast<float>(z0))));
+  if (CullFlags(packed) != CullFlagsVisible) return;
+  const int x = static_cast<std::int16_t>(_mm_extract_epi16(packed.v, 0));
+  const int y = static_cast<std::int16_t>(_mm_extract_epi16(packed.v, 1));
   line(x, y, x, y, colour, mode);
 }
