@@ -32,6 +32,7 @@ VELMARK5_LANE Float4 splat(float x) { return {_mm_set1_ps(x)}; }
 VELMARK5_LANE Float4 floats(float a, float b, float c, float d) { return {_mm_setr_ps(a, b, c, d)}; }
 VELMARK5_LANE Float4 load(const float* p) { return {_mm_load_ps(p)}; }
 VELMARK5_LANE Float4 load_unaligned(const float* p) { return {_mm_loadu_ps(p)}; }
+VELMARK5_LANE Float4 load_one(const float* p) { return {_mm_load_ss(p)}; }
 VELMARK5_LANE void store(float* p, Float4 a) { _mm_store_ps(p, a.v); }
 VELMARK5_LANE void store_unaligned(float* p, Float4 a) { _mm_storeu_ps(p, a.v); }
 
@@ -89,6 +90,10 @@ VELMARK5_LANE Int4 shift_left(Int4 a) {
 // One bit for each lane's sign.
 VELMARK5_LANE int lane_bits(Int4 mask) { return _mm_movemask_ps(_mm_castsi128_ps(mask.v)); }
 VELMARK5_LANE Int4 truncate(Float4 a) { return {_mm_cvttps_epi32(a.v)}; }
+// Of one float; what does not fit becomes the lowest integer.
+VELMARK5_LANE int truncate(float a) { return _mm_cvttss_si32(_mm_set_ss(a)); }
+VELMARK5_LANE Int4 add_bytes(Int4 a, Int4 b) { return {_mm_add_epi8(a.v, b.v)}; }
+VELMARK5_LANE Int4 equal_bytes(Int4 a, Int4 b) { return {_mm_cmpeq_epi8(a.v, b.v)}; }
 VELMARK5_LANE Int4 add_saturating_bytes(Int4 a, Int4 b) { return {_mm_adds_epu8(a.v, b.v)}; }
 VELMARK5_LANE Int4 subtract_saturating_bytes(Int4 a, Int4 b) { return {_mm_subs_epu8(a.v, b.v)}; }
 
