@@ -55,9 +55,10 @@ struct fake_desktop {
 
 fake_desktop* desk = nullptr;
 
-std::string numbers(std::initializer_list<long> values) {
+template <class... Numbers>
+std::string numbers(Numbers... values) {
   std::string text;
-  for (const long v : values) text += (text.empty() ? "" : ",") + std::to_string(v);
+  ((text += (text.empty() ? "" : ",") + std::to_string(values)), ...);
   return text;
 }
 
@@ -79,7 +80,7 @@ int destroy_image(XImage* image) {
 XImage* make_image(const char* name, Display*, Visual* visual, unsigned depth, int format, char* data, unsigned width,
                    unsigned height, const std::string& more) {
   EXPECT_EQ(visual, desk->screens[0].root_visual);
-  if (!desk->call(name, numbers({static_cast<long>(depth), format, width, height}) + more)) return nullptr;
+  if (!desk->call(name, numbers(depth, format, width, height) + more)) return nullptr;
   ++desk->images;
   auto* image = new XImage{};
   image->data = data;
@@ -113,7 +114,7 @@ const display_binding& fake_desktop::binding() {
   static const display_binding fakes = [] {
     display_binding b{};
     b.JAWT_GetAWT = [](JNIEnv*, JAWT* awt) -> jboolean {
-      if (!desk->call("GetAWT", numbers({awt->version & 0xF}))) return JNI_FALSE;
+      if (!desk->call("GetAWT", numbers(awt->version & 0xF))) return JNI_FALSE;
       awt->Lock = awt_lock, awt->Unlock = awt_unlock;
       awt->GetDrawingSurface = get_surface, awt->FreeDrawingSurface = free_surface;
       return JNI_TRUE;
@@ -130,7 +131,7 @@ const display_binding& fake_desktop::binding() {
     };
     b.XCreateImage = [](Display* d, Visual* v, unsigned depth, int format, int offset, char* data, unsigned w,
                         unsigned h, int pad, int stride) {
-      return make_image("XCreateImage", d, v, depth, format, data, w, h, " " + numbers({offset, pad, stride}));
+      return make_image("XCreateImage", d, v, depth, format, data, w, h, " " + numbers(offset, pad, stride));
     };
     b.XShmAttach = [](Display*, XShmSegmentInfo* segment) -> int {
       ++desk->display.request;
@@ -148,12 +149,12 @@ const display_binding& fake_desktop::binding() {
     b.XShmPutImage = [](Display*, Drawable drawable, GC gc, XImage* image, int x, int y, int to_x, int to_y, unsigned w,
                         unsigned h, int event) -> int {
       EXPECT_TRUE(gc == desk->screens[0].default_gc && desk->mapped.count(image->data) == 1 && desk->locks > 0);
-      return desk->call("XShmPutImage", numbers({static_cast<long>(drawable), x, y, to_x, to_y, w, h, event}));
+      return desk->call("XShmPutImage", numbers(drawable, x, y, to_x, to_y, w, h, event));
     };
     b.XPutImage = [](Display*, Drawable drawable, GC gc, XImage*, int x, int y, int to_x, int to_y, unsigned w,
                      unsigned h) -> int {
       EXPECT_TRUE(gc == desk->screens[0].default_gc && desk->locks > 0);
-      return desk->call("XPutImage", numbers({static_cast<long>(drawable), x, y, to_x, to_y, w, h}));
+      return desk->call("XPutImage", numbers(drawable, x, y, to_x, to_y, w, h));
     };
     b.XFree = [](void* image) -> int {
       --desk->images;
@@ -170,7 +171,7 @@ const display_binding& fake_desktop::binding() {
     b.XSetErrorHandler = [](XErrorHandler fresh) { return std::exchange(desk->handler, fresh); };
     b.shmget = [](key_t key, size_t size, int flags) {
       EXPECT_EQ(key, IPC_PRIVATE);
-      if (!desk->call("shmget", numbers({static_cast<long>(size), flags}))) return -1;
+      if (!desk->call("shmget", numbers(size, flags))) return -1;
       return *desk->segments.insert(desk->counts["shmget"]).first;
     };
     b.shmat = [](int, const void*, int) -> void* {
