@@ -21,6 +21,7 @@ static_assert(std::size(table) == triangle_instance_count);
 
 }  // namespace
 
-std::span<const TriangleInstance> triangle_instances() { return table; }
+// Retained, so that the linker keeps every instance.
+[[gnu::used, gnu::retain]] std::span<const TriangleInstance> triangle_instances() { return table; }
 
 }  // namespace Rasterizer_n
