@@ -177,6 +177,7 @@ struct fake_calls {
       java(env).raise("java/lang/NegativeArraySizeException", std::to_string(length).c_str());
       return nullptr;
     }
+    if (java(env).out_of_memory(env)) return nullptr;
     return java(env).new_ints(std::vector<jint>(static_cast<std::size_t>(length)));
   }
   static jint JNICALL ThrowNew(JNIEnv* env, jclass java_class, const char* message) {
@@ -405,6 +406,12 @@ void fake_java::enter(JNIEnv* caller, const char* function, bool legal_with_exce
   }
 }
 
+bool fake_java::out_of_memory(JNIEnv* caller) {
+  if (array_access_failure == 0 || --array_access_failure > 0) return false;
+  throw_object(caller, make("java/lang/OutOfMemoryError"));
+  return true;
+}
+
 void* fake_java::hand_out(JNIEnv* caller, jobject reference, bool critical, const char* type) {
   const std::lock_guard guard(lock);
   if (reference == nullptr) {
@@ -416,11 +423,7 @@ void* fake_java::hand_out(JNIEnv* caller, jobject reference, bool critical, cons
     violation(std::string(type != nullptr ? type : "primitive") + " elements of " + array->class_name);
     return nullptr;
   }
-  if (array_access_failure > 0 && --array_access_failure == 0) {
-    fake_object* const exception = make("java/lang/OutOfMemoryError");
-    throw_object(caller, exception);
-    return nullptr;
-  }
+  if (out_of_memory(caller)) return nullptr;
   auto storage = std::make_unique<unsigned char[]>(odd_offset + array->bytes.size() + guard_bytes);
   unsigned char* const elements = storage.get() + odd_offset;
   std::copy(array->bytes.begin(), array->bytes.end(), elements);

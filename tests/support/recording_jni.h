@@ -78,8 +78,8 @@ class fake_java {
   int weak_references() const { return live_weak; }
   int arrays_out() const;  // handed out, not given back
 
-  // Makes Get<Type>ArrayElements and GetPrimitiveArrayCritical number `n` from now answer null with an
-  // OutOfMemoryError pending; 0 for none.
+  // Makes NewIntArray, Get<Type>ArrayElements and GetPrimitiveArrayCritical, counted together, number `n` from now
+  // answer null with an OutOfMemoryError pending; 0 for none.
   void fail_array_access(int n) { array_access_failure = n; }
 
  private:
@@ -99,6 +99,7 @@ class fake_java {
   void enter(JNIEnv* caller, const char* function, bool legal_with_exception = false, bool legal_when_pinned = false);
   void* hand_out(JNIEnv* caller, jobject array, bool critical, const char* type);
   void give_back(JNIEnv* caller, jobject array, void* elements, jint mode, bool critical);
+  bool out_of_memory(JNIEnv* caller);
   void throw_object(JNIEnv* caller, fake_object* exception);
 
   mutable std::recursive_mutex lock;
