@@ -161,7 +161,10 @@ const display_binding& fake_desktop::binding() {
       delete static_cast<XImage*>(image);
       return desk->call("XFree");
     };
-    b.XFlush = [](Display*) -> int { return desk->locks > 0; };
+    b.XFlush = [](Display*) -> int {
+      EXPECT_GT(desk->locks, 0);
+      return desk->call("XFlush");
+    };
     b.XSync = [](Display*, int discard) -> int {
       EXPECT_EQ(discard, 0);
       if (desk->others_errors != 0) report(desk->display.request - 2);
@@ -261,7 +264,7 @@ TEST_F(canvas_test, shared_images_come_and_go_in_order) {
   EXPECT_EQ(desktop.segments.size(), 0u) << "a killed process would leave segments";
   c.reset();
   const strings gone{"XShmDetach", "destroy image", "shmdt"};
-  expect_calls((strings{"GetAWT 4", "Lock"}) + gone + gone + strings{"Unlock"});
+  expect_calls((strings{"GetAWT 4", "Lock"}) + gone + gone + strings{"XFlush", "Unlock"});
   desktop.expect_nothing_held();
 }
 
@@ -313,7 +316,7 @@ TEST_F(canvas_test, flips_take_turns_and_take_the_targets_along) {
   unsigned int* const first = c->colourbuffer;
   forget_calls();
   c->flip(5, 6, 20, 10);
-  expect_calls(open_flip + strings{"XShmPutImage 7,5,6,0,0,20,10,0"} + close_flip);
+  expect_calls(open_flip + strings{"XShmPutImage 7,5,6,0,0,20,10,0", "XFlush"} + close_flip);
   EXPECT_EQ(static_cast<void*>(c->colourbuffer), c->shm[1].shmaddr);
   EXPECT_EQ(kit().colourbuffer, c->colourbuffer);
   EXPECT_EQ(Rasterizer_n::m_pColourBuffer, c->colourbuffer);
@@ -333,7 +336,7 @@ TEST_F(canvas_test, a_plain_flip_leaves_the_targets) {
   unsigned int* const first = c->colourbuffer;
   forget_calls();
   c->flip(5, 6, 20, 10);
-  expect_calls(open_flip + strings{"XPutImage 7,5,6,0,0,20,10"} + close_flip);
+  expect_calls(open_flip + strings{"XPutImage 7,5,6,0,0,20,10", "XFlush"} + close_flip);
   EXPECT_EQ(c->colourbuffer, first);
   EXPECT_EQ(kit().colourbuffer, nullptr);
   EXPECT_EQ(Rasterizer_n::m_pColourBuffer, nullptr);
