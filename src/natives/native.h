@@ -21,11 +21,36 @@
 
 namespace natives {
 
+#if defined(__i386__)
+// 32-bit runtimes may cut x87 arithmetic to double precision. While one of these lives, extended precision is what it says.
+class extended_precision {
+ public:
+  extended_precision() {
+    asm volatile("fnstcw %0" : "=m"(callers)::"memory");
+    if (callers == full()) return;
+    const unsigned short own = full();
+    asm volatile("fldcw %0" ::"m"(own) : "memory");
+  }
+  ~extended_precision() {
+    if (callers != full()) asm volatile("fldcw %0" ::"m"(callers) : "memory");
+  }
+  extended_precision(const extended_precision&) = delete;
+  extended_precision& operator=(const extended_precision&) = delete;
+
+ private:
+  unsigned short full() const { return callers | 0x300; }
+  unsigned short callers;
+};
+#else
+struct extended_precision {};
+#endif
+
 // Runs the body and turns whatever it throws into the pending Java exception. The views that the body declares are gone
 // by then, so nothing is raised while an array is pinned. On failure the result is a zero that no caller reads.
 template <class Body>
 auto frame(JNIEnv* env, Body&& body) noexcept -> decltype(body()) {
   using Result = decltype(body());
+  [[maybe_unused]] const extended_precision precision;
   try {
     return body();
   } catch (Exception* failure) {
@@ -33,7 +58,9 @@ auto frame(JNIEnv* env, Body&& body) noexcept -> decltype(body()) {
     // A callback's own exception stays: it came first, and it says more.
     if (!env->ExceptionCheck()) failure->throwJavaException(env);
   } catch (...) {
-    env->ThrowNew(env->FindClass("java/lang/RuntimeException"), "System exception occured");
+    if (!env->ExceptionCheck()) {
+      env->ThrowNew(env->FindClass("java/lang/RuntimeException"), "System exception occured");
+    }
   }
   return Result();
 }

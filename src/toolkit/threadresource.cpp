@@ -4,6 +4,10 @@
 
 #include "toolkit/toolkit.h"
 
+int threadresource_debugcount = 0;
+
+void dump_instances(char*) {}
+
 threadresource::threadresource(toolkit& of, int first, int second) : owner(&of), a(first), b(second) {
   std::memset(vertices, 0, sizeof vertices);
   std::memset(vertex_words, 0, sizeof vertex_words);

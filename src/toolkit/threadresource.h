@@ -7,6 +7,10 @@
 
 class toolkit;
 
+// For debuggers: a count that nothing keeps, and a listing that lists nothing.
+extern int threadresource_debugcount;
+void dump_instances(char* out);
+
 struct alignas(16) threadresource : linkable {
   static constexpr int max_vertices = 16768;
   static constexpr int light_table_vectors = 1249;

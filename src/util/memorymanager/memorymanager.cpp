@@ -6,6 +6,7 @@
 #include <cstdio>
 #include <cstring>
 #include <limits>
+#include <vector>
 
 #include "util/exception.h"
 #include "util/memorymanager/alignedmemory.h"
@@ -25,6 +26,12 @@ unsigned char* align_up(unsigned char* p, unsigned int alignment) {
 // True when length bytes at candidate end at or before limit; written without a sum that could wrap.
 bool fits(const unsigned char* candidate, unsigned int length, const unsigned char* limit) {
   return candidate <= limit && static_cast<std::size_t>(limit - candidate) >= length;
+}
+
+[[noreturn]] void throw_growth_failed(std::uint64_t wanted) {
+  char text[200];
+  std::snprintf(text, sizeof text, "native(MPR: %d)", static_cast<int>(wanted >> 10));
+  throw new OutOfMemory(text);
 }
 
 }  // namespace
@@ -50,19 +57,46 @@ memorymanager::~memorymanager() {
 }
 
 unsigned char* memorymanager::defragment() {
+  // From the lowest block to the highest, each moves down onto the end of the one before.
   unsigned char* top = base;
   for (linkable* node = blocks.prev; node != &blocks;) {
     auto* block = static_cast<allocatedmemory*>(node);
-    node = node->prev;
-    top = align_up(top, block->alignment);
-    block->relocate(top);
-    top += block->length;
+    unsigned char* to = align_up(top, block->alignment);
+    if (to <= block->address) {
+      block->relocate(to);
+      top = to + block->length;
+      node = node->prev;
+      continue;
+    }
+
+    // Storage that a growth moved can lie at another phase, so that alignment pushes blocks up, into the ones above. A
+    // run of such blocks moves from its highest to its lowest. No push exceeds the greatest alignment, for which the
+    // slack has room.
+    linkable* const first = node;
+    linkable* last = node;
+    std::vector<unsigned char*> places;
+    for (; node != &blocks; node = node->prev) {
+      block = static_cast<allocatedmemory*>(node);
+      to = align_up(top, block->alignment);
+      if (to <= block->address) break;
+      places.push_back(to);
+      top = to + block->length;
+      last = node;
+    }
+    for (;; last = last->next) {
+      static_cast<allocatedmemory*>(last)->relocate(places.back());
+      places.pop_back();
+      if (last == first) break;
+    }
   }
   return top;
 }
 
 allocatedmemory_autopointer memorymanager::allocate(unsigned int length, unsigned int alignment) {
   alignment = std::max(alignment, 8u);
+  if (base == nullptr) throw new IllegalStateException("the pool's storage is released");
+  // Lengths are signed. A longer block could not be had in 32 bits either.
+  if (length > std::numeric_limits<int>::max()) throw_growth_failed(length);
   monitor_enter();
   if (move_at_every_allocation) move_storage();
   unsigned char* address = findspace(length, alignment, true);
@@ -112,11 +146,7 @@ void memorymanager::resizepool() {
   if (grows && total <= std::numeric_limits<std::size_t>::max()) {
     moved = static_cast<unsigned char*>(_aligned_realloc(base, static_cast<std::size_t>(total), storage_alignment));
   }
-  if (moved == nullptr) {
-    char text[200];
-    std::snprintf(text, sizeof text, "native(MPR: %d)", static_cast<int>(newsize >> 10));
-    throw new OutOfMemory(text);
-  }
+  if (moved == nullptr) throw_growth_failed(newsize);
   rebase_blocks(moved);
   size = static_cast<unsigned int>(newsize);
 }

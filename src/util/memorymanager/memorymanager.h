@@ -27,7 +27,8 @@ class memorymanager {
   virtual void monitor_exit() {}
   virtual unsigned char* defragment();  // returns the first free address
 
-  // A block of `length` bytes at a multiple of `alignment` (at least 8). Throws OutOfMemory* with the pool intact.
+  // A block of `length` bytes at a multiple of `alignment` (at least 8). Throws OutOfMemory* with the pool intact, and
+  // IllegalStateException* after release_resources.
   allocatedmemory_autopointer allocate(unsigned int length) { return allocate(length, 8); }
   allocatedmemory_autopointer allocate(unsigned int length, unsigned int alignment);
 

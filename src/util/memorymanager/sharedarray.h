@@ -1,6 +1,10 @@
 // Typed arrays over a pool: sharedarray and sharedarray2d share their block with their copies and move with it.
 #pragma once
 
+#include <algorithm>
+#include <cstdint>
+#include <limits>
+
 #include "util/memorymanager/memorymanager.h"
 
 template <class T>
@@ -10,8 +14,10 @@ class sharedarray : public allocatedmemory_autopointer {
 
   // `count` elements from `pool`, not initialised beyond what the pool holds. Can move every block of the pool.
   static sharedarray allocate(memorymanager& pool, unsigned int count) {
+    // Bytes that no pool can hold must not wrap to a few.
+    const auto bytes = std::min<std::uint64_t>(std::uint64_t{count} * sizeof(T), std::numeric_limits<unsigned>::max());
     sharedarray array;
-    static_cast<allocatedmemory_autopointer&>(array) = pool.allocate(count * sizeof(T), alignof(T));
+    static_cast<allocatedmemory_autopointer&>(array) = pool.allocate(static_cast<unsigned>(bytes), alignof(T));
     array.manager = &pool;
     return array;
   }

@@ -1,6 +1,7 @@
 // Array of fixed length on the heap. It never moves.
 #pragma once
 
+#include <limits>
 #include <memory>
 #include <type_traits>
 #include <utility>
@@ -14,7 +15,9 @@ class simplearray {
   // `count` elements; built where T has a constructor, left alone otherwise. A count of 0 or less has no element.
   explicit simplearray(int length) : count(length), data(nullptr) {
     const std::size_t elements = length > 0 ? static_cast<std::size_t>(length) : 0;
-    data = static_cast<T*>(_aligned_malloc(elements * sizeof(T), 4));
+    if (elements <= std::numeric_limits<std::size_t>::max() / sizeof(T)) {
+      data = static_cast<T*>(_aligned_malloc(elements * sizeof(T), 4));
+    }
     if (data == nullptr) throw new OutOfMemory("native(SIA)");
     if constexpr (!std::is_trivially_default_constructible_v<T>) std::uninitialized_default_construct_n(data, elements);
   }

@@ -1,0 +1,15 @@
+// Failing allocations: the test program routes the library's posix_memalign and realloc through here.
+#pragma once
+
+namespace allocation_failure {
+
+// The call of posix_memalign number `n` from now returns the error code; 0 for none.
+void fail_memalign(int n, int error);
+
+// Every realloc returns null, while set.
+void fail_realloc(bool fail);
+
+// Every realloc moves the block, while set, to an address that is `phase` (a multiple of 16) beyond a multiple of 128.
+void move_realloc(bool move, unsigned int phase = 16);
+
+}  // namespace allocation_failure
