@@ -22,7 +22,8 @@
 namespace natives {
 
 #if defined(__i386__)
-// 32-bit runtimes may cut x87 arithmetic to double precision. While one of these lives, extended precision is what it says.
+// 32-bit runtimes may cut x87 arithmetic to double precision. While one of these lives, extended precision is what it
+// says.
 class extended_precision {
  public:
   extended_precision() {
