@@ -1,5 +1,5 @@
+# shellcheck shell=bash
 # Shared by the scripts of this project; source it, do not run it.
-
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
 build=$root/build
 logs=$build/logs
@@ -7,35 +7,58 @@ jobs=${VELMARK5_JOBS:-$(nproc)}
 
 # The private 32-bit Java runtime lives outside the tree. Its name ends in Debian's Java version and a number of our own:
 # raise the number when the layout below it changes.
-jre32=${XDG_CACHE_HOME:-$HOME/.cache}/velmark5/jre-i386-17-1
+jre32=${XDG_CACHE_HOME:-${HOME:-/tmp}/.cache}/velmark5/jre-i386-17-1
 
 fail() {
   echo "velmark5: $*" >&2
   exit 1
 }
 
+# log_name TITLE: the log file of a stage or suite.
+log_name() {
+  mkdir -p "$logs"
+  echo "$logs/$(tr -cs 'a-zA-Z0-9\n' - <<<"$1").log"
+}
+
+# start LOG COMMAND...: starts the command in the background, in a process group of its own that an interrupt of this
+# script ends as a whole; sets started. finish_started waits for it and returns its exit code.
+start() {
+  local log=$1
+  shift
+  set -m
+  "$@" </dev/null >"$log" 2>&1 &
+  started=$!
+  set +m
+  trap 'kill -- -"$started" 2>/dev/null; exit 130' INT TERM
+}
+
+finish_started() {
+  local rc=0
+  wait "$started" || rc=$?
+  trap - INT TERM
+  return "$rc"
+}
+
 # stage TITLE COMMAND...: runs the command with its output in a log file and prints one line with the time it took. A
 # long command shows its last line of output every 20 seconds; a failed one shows the end of its log.
 stage() {
-  local title=$1 log rc=0 pid start=$SECONDS next=20
+  local title=$1 log rc=0 begin=$SECONDS next=20
   shift
-  mkdir -p "$logs"
-  log=$logs/$(tr -cs 'a-zA-Z0-9\n' - <<<"$title").log
-  "$@" </dev/null >"$log" 2>&1 &
-  pid=$!
-  while kill -0 "$pid" 2>/dev/null; do
+  log=$(log_name "$title")
+  start "$log" "$@"
+  while kill -0 "$started" 2>/dev/null; do
     sleep 0.2
-    if ((SECONDS - start >= next)); then
+    if ((SECONDS - begin >= next)); then
       next=$((next + 20))
-      echo "  ... $title, $((SECONDS - start)) s: $(tail -n 1 "$log" | tr -d '\r' | cut -c 1-100)"
+      echo "  ... $title, $((SECONDS - begin)) s: $(tail -n 1 "$log" | tr -d '\r' | cut -c 1-100)"
     fi
   done
-  wait "$pid" || rc=$?
+  finish_started || rc=$?
   if ((rc)); then
-    echo "  $title: failed after $((SECONDS - start)) s (exit code $rc); the end of $log:"
+    echo "  $title: failed after $((SECONDS - begin)) s (exit code $rc); the end of $log:"
     tail -n 40 "$log"
   else
-    printf '  %-52s %4d s\n' "$title" $((SECONDS - start))
+    printf '  %-52s %4d s\n' "$title" $((SECONDS - begin))
   fi
   return "$rc"
 }
