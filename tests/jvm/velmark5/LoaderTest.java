@@ -72,15 +72,10 @@ class LoaderTest {
     return copy;
   }
 
-  /** Runs {@link Probe} in a runtime started as this one was, and returns what it prints. */
+  /** Runs {@link Probe} in a runtime of the same kind and returns what it prints. */
   private static List<String> run(String... options) throws Exception {
     List<String> command = new ArrayList<>();
-    for (String word : Files.readString(Path.of("/proc/self/cmdline")).split("\0")) {
-      command.add(word);
-      if (word.equals("java") || word.endsWith("/java")) {
-        break;
-      }
-    }
+    command.add(System.getProperty("velmark5.java", System.getProperty("java.home") + "/bin/java"));
     String path = System.getProperty(NativeLibrary.PATH_PROPERTY);
     if (path != null && !List.of(options).contains("-cp")) {
       command.add("-D" + NativeLibrary.PATH_PROPERTY + "=" + path);
