@@ -220,10 +220,10 @@ TEST_F(primitives, draw_as_the_oracle_does) {
   }
 
   std::uint64_t frames = 0;
-  for (int target = 0; target < 160; ++target) {
+  for (int target = 0; target < 600; ++target) {
     make_target(random.between(1, 75), random.between(1, 50), !random.one_in(12), random.one_in(2));
     randomise(random);
-    for (int i = 0; i < 50; ++i) {
+    for (int i = 0; i < 60; ++i) {
       if (i % 5 == 0) {
         if (random.one_in(4)) {
           Java_ja_L(env, peer);
