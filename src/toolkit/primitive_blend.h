@@ -84,6 +84,10 @@ VELMARK5_LANE bool on_group_boundary(const std::uint32_t* p) { return (reinterpr
 template <class Operation>
 inline void draw_run(std::uint32_t* p, std::size_t n, const Operation& operation) {
   for (; n > 0 && !on_group_boundary(p); --n, ++p) plot(p, operation);
+  for (; n >= 16; n -= 16, p += 16) {
+#pragma GCC unroll 4
+    for (int i = 0; i < 16; i += 4) store(p + i, operation(load(p + i)));
+  }
   for (; n >= 4; n -= 4, p += 4) store(p, operation(load(p)));
   for (; n > 0; --n, ++p) plot(p, operation);
 }
@@ -93,10 +97,8 @@ inline void stream_run(std::uint32_t* p, std::size_t n, std::uint32_t word) {
   const Int4 group = splat(word);
   for (; n > 0 && !on_group_boundary(p); --n, ++p) stream_one(p, word);
   for (; n >= 16; n -= 16, p += 16) {
-    stream(p, group);
-    stream(p + 4, group);
-    stream(p + 8, group);
-    stream(p + 12, group);
+#pragma GCC unroll 4
+    for (int i = 0; i < 16; i += 4) stream(p + i, group);
   }
   for (; n >= 4; n -= 4, p += 4) stream(p, group);
   for (; n > 0; --n, ++p) stream_one(p, word);

@@ -94,7 +94,7 @@ void toolkit::circle_fill(int x, int y, int z, int radius, unsigned int colour, 
       int64_t j = r;
       const auto too_wide = [&](int64_t width_now) {
         const int64_t square = width_now * width_now;
-        return rr < q + square - width_now && rr < p + square + width_now;
+        return rr < q - width_now + square && rr < p + width_now + square;
       };
       for (; row < bottom && j >= enter; ++row) {
         if (j > cover && too_wide(cover + 1)) j = cover;
