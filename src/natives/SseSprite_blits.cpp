@@ -81,3 +81,46 @@ Java_fa_o(JNIEnv* env, jobject, jlong handle, jint x, jint y, jlong mask_id, jin
     draw(&Sprite_c::Render<ColourOp_e::none, BlendMode_e::alpha, VELMARK5_MASKED>, handle, params, target);
   });
 }
+
+VELMARK5_NATIVE(void)
+Java_fa_e(JNIEnv* env, jobject, jlong handle, jfloat x0, jfloat y0, jfloat x1, jfloat y1, jfloat x2, jfloat y2,
+          jint colourop, jint colour, jint blend) {
+  frame(env, [&] {
+    const SpriteTarget_s target = sprite_target(current_toolkit());
+    if (target.colour == nullptr) return;
+    const auto& sprite = from_handle<Sprite_c>(handle);
+    ParallelogramRenderParams params = {x0, x1, x2, y0, y1, y2};
+    params.colour = static_cast<unsigned int>(colour);
+    const auto render = sprite_select::parallelogram(colourop, blend);
+    if (render != nullptr) (sprite.*render)(params, target);
+  });
+}
+
+VELMARK5_NATIVE(void)
+Java_fa_FA(JNIEnv* env, jobject, jlong handle, jfloat x0, jfloat y0, jfloat x1, jfloat y1, jfloat x2, jfloat y2, jint,
+           jlong mask_id, jint maskx, jint masky, jint blend) {
+  frame(env, [&] {
+    const SpriteTarget_s target = sprite_target(current_toolkit());
+    if (target.colour == nullptr) return;
+    const auto& sprite = from_handle<Sprite_c>(handle);
+    const SpanMask_s mask = span_mask(from_handle<clippingmask>(mask_id));
+    ParallelogramRenderParams params = {x0, x1, x2, y0, y1, y2};
+    params.mask = &mask;
+    params.maskx = maskx;
+    params.masky = masky;
+    if (blend == static_cast<int>(BlendMode_e::alpha)) {
+      sprite.RenderParallelogram<ColourOp_e::none, BlendMode_e::alpha, true>(params, target);
+    } else {
+      sprite.RenderParallelogram<ColourOp_e::none, BlendMode_e::replace, true>(params, target);
+    }
+  });
+}
+
+VELMARK5_NATIVE(void)
+Java_fa_aa(JNIEnv* env, jobject, jlong handle, jint x, jint y, jint w, jint h, jint colourop, jint colour, jint blend) {
+  frame(env, [&] {
+    const SpriteTarget_s target = sprite_target(current_toolkit());
+    if (target.colour == nullptr) return;
+    draw(sprite_select::tiled(colourop, blend), handle, sized(x, y, w, h, colour), target);
+  });
+}

@@ -34,6 +34,7 @@ struct RenderParams_s {
 struct ParallelogramRenderParams {
   float x0, x1, x2;
   float y0, y1, y2;
+  unsigned int unused = 0;  // never read
   unsigned int colour = 0;
   const SpanMask_s* mask = nullptr;
   int maskx = 0, masky = 0;

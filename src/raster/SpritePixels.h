@@ -151,9 +151,10 @@ struct Blending<BlendMode_e::additive> {
 
 // --- Runs -----------------------------------------------------------------------------------------------------------
 
-// Draws n pixels to `to`. source(i) gives the four pixels from i on, source.one(i) pixel i in lane 0.
+// Draws n pixels to `to`. source(i) gives the four pixels from i on, source.one(i) pixel i in lane 0; they are asked
+// for in order and once each.
 template <ColourOp_e Op, BlendMode_e Blend, class Source>
-VELMARK5_LANE void draw_run(std::uint32_t* to, int n, const Operation<Op>& operation, const Source& source) {
+VELMARK5_LANE void draw_run(std::uint32_t* to, int n, const Operation<Op>& operation, Source source) {
   constexpr Blending<Blend> blend;
   int i = 0;
   for (; i + 4 <= n; i += 4) {
@@ -169,7 +170,7 @@ VELMARK5_LANE void draw_run(std::uint32_t* to, int n, const Operation<Op>& opera
 // The same where z <= depth.
 template <ColourOp_e Op, BlendMode_e Blend, class Source>
 VELMARK5_LANE void draw_run_tested(std::uint32_t* to, const float* depth, Float4 z, int n,
-                                   const Operation<Op>& operation, const Source& source) {
+                                   const Operation<Op>& operation, Source source) {
   constexpr Blending<Blend> blend;
   int i = 0;
   for (; i + 4 <= n; i += 4) {
@@ -204,6 +205,29 @@ struct Columns {
     return gathered(from[column[i]], from[column[i + 1]], from[column[i + 2]], from[column[i + 3]]);
   }
   VELMARK5_LANE Int4 one(int i) const { return load_one(from + column[i]); }
+};
+
+// The pixels along a line through the image: u and v in 20.12 fixed point, inside the image at every pixel that is
+// asked for.
+struct Line {
+  const std::uint32_t* from;
+  std::uint32_t width;
+  std::uint32_t u, v, du, dv;
+
+  VELMARK5_LANE Int4 operator()(int) {
+    const std::uint32_t a = next();
+    const std::uint32_t b = next();
+    const std::uint32_t c = next();
+    return gathered(a, b, c, next());
+  }
+  VELMARK5_LANE Int4 one(int) { return splat(next()); }
+
+  VELMARK5_LANE std::uint32_t next() {
+    const std::uint32_t pixel = from[(v >> 12) * width + (u >> 12)];
+    u += du;
+    v += dv;
+    return pixel;
+  }
 };
 
 }  // namespace sprite_pixels

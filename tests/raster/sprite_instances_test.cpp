@@ -44,4 +44,12 @@ TEST(sprite_instances, render) {
   EXPECT_EQ(found.count("(ColourOp_e)1, (BlendMode_e)1, false, true, true, false"), 1u);
 }
 
+TEST(sprite_instances, parallelograms_and_tiles) {
+  const auto found = instances("RenderParallelogram");
+  EXPECT_EQ(found.size(), 17u);
+  EXPECT_EQ(found.count("(ColourOp_e)1, (BlendMode_e)0, true"), 1u);
+  EXPECT_EQ(found.count("(ColourOp_e)1, (BlendMode_e)1, true"), 1u);
+  EXPECT_EQ(instances("RenderTiled").size(), 15u);
+}
+
 }  // namespace

@@ -1,3 +1,6 @@
+#include <climits>
+#include <limits>
+
 #include "raster/sprite_scene.h"
 
 namespace {
@@ -80,6 +83,90 @@ TEST_F(sprite_render, masked_equals_the_reference) {
   record("sprite_masked");
 }
 
+// The corners of a sprite of the image's size, turned, sheared and scaled.
+void random_corners(test_random& random, float corners[6]) {
+  corners[0] = random.real(-20, 70);
+  corners[1] = random.real(-20, 50);
+  for (int i = 2; i < 6; ++i) corners[i] = corners[i % 2] + random.real(-40, 40);
+  if (random.one_in(3)) {  // axes along the target's, in whole pixels
+    for (int i = 0; i < 6; ++i) corners[i] = static_cast<float>(static_cast<int>(corners[i]));
+    const bool turned = random.one_in(2);
+    corners[turned ? 2 : 3] = corners[turned ? 0 : 1];
+    corners[turned ? 5 : 4] = corners[turned ? 1 : 0];
+  }
+}
+
+TEST_F(sprite_render, parallelograms_equal_the_reference) {
+  every_pair(*this, "parallelogram", 120, false, 24, [&](test_random& random, const sprite_oracle::modes& m) {
+    float c[6];
+    random_corners(random, c);
+    Java_fa_e(env, nullptr, handle(), c[0], c[1], c[2], c[3], c[4], c[5], m.colourop, as_int(m.colour), m.blend);
+    sprite_oracle::draw_parallelogram(expected, image, m, c, nullptr);
+  });
+}
+
+// Any other blend than 1 replaces.
+TEST_F(sprite_render, masked_parallelograms_equal_the_reference) {
+  for (int call = 0; call < 600; ++call) {
+    test_random random(static_cast<std::uint64_t>(call) + 300);
+    random_target(random, random.between(1, 60), random.between(1, 40), false);
+    random_sprite(random, random.between(1, 30), random.between(1, 30), random.one_in(2));
+    random_mask(random, 50, 40);
+    float c[6];
+    random_corners(random, c);
+    const int blend = random.between(0, 2);
+    Java_fa_FA(env, nullptr, handle(), c[0], c[1], c[2], c[3], c[4], c[5], 99, mask_handle(), mask.x, mask.y, blend);
+    sprite_oracle::draw_parallelogram(expected, image, {1, 0, blend == 1 ? 1 : 0}, c, &mask);
+    ASSERT_TRUE(same()) << "call " << call;
+  }
+  record("sprite_masked_parallelogram");
+}
+
+TEST_F(sprite_render, a_parallelogram_of_the_images_size_draws_it_unchanged) {
+  for (int size = 1; size < 40; ++size) {
+    test_random random(static_cast<std::uint64_t>(size));
+    random_target(random, 50, 50, false);
+    kit().resetclipping();
+    random_sprite(random, size, 41 - size, true);
+    const auto x = static_cast<float>(-image.left), y = static_cast<float>(-image.top);
+    Java_fa_e(env, nullptr, handle(), x, y, x + static_cast<float>(sprite->full_width()), y, x,
+              y + static_cast<float>(sprite->full_height()), 1, 0, 0);
+    // Half of an odd size loses half a texel, which the pixel's centre makes up for in this direction.
+    for (int i = 0; i < size * (41 - size); ++i) {
+      ASSERT_EQ(colour.at(i % size, i / size), image.pixels[static_cast<std::size_t>(i)]) << size << " " << i;
+    }
+  }
+}
+
+TEST_F(sprite_render, tiles_equal_the_reference) {
+  every_pair(*this, "tiled", 60, false, 16, [&](test_random& random, const sprite_oracle::modes& m) {
+    const int x = random.between(-40, 60), y = random.between(-40, 40);
+    const int w = random.between(-20, 100), h = random.between(-20, 90);
+    const std::vector<int> clip = {kit().clip_x0, kit().clip_y0, kit().clip_x1, kit().clip_y1};
+    Java_fa_aa(env, nullptr, handle(), x, y, w, h, m.colourop, as_int(m.colour), m.blend);
+    sprite_oracle::draw_tiled(expected, image, m, x, y, w, h);
+    ASSERT_EQ(clip, (std::vector<int>{kit().clip_x0, kit().clip_y0, kit().clip_x1, kit().clip_y1}));
+    ASSERT_EQ(Rasterizer_n::GetCliprect()->x, clip[0]);
+    ASSERT_EQ(Rasterizer_n::GetCliprect()->width, clip[2] - clip[0]);
+  });
+}
+
+TEST_F(sprite_render, tiles_of_no_size_and_huge_areas) {
+  test_random random(8);
+  random_target(random, 30, 30, false);
+  random_sprite(random, 0, 0, false);
+  Java_fa_aa(env, nullptr, handle(), 0, 0, 20, 20, 1, 0, 0);
+  EXPECT_TRUE(same()) << "an image of no size draws nothing";
+  random_sprite(random, 3, 2, false);
+  Java_fa_aa(env, nullptr, handle(), -2000000001, -4, INT_MAX, INT_MAX, 1, 0, 0);
+  for (int y = expected.clip_y0; y < expected.clip_y1; ++y) {
+    for (int x = expected.clip_x0; x < expected.clip_x1; ++x) {
+      expected.at(x, y) = image.word((y + 4) % 2 * 3 + (x + 2000000001) % 3);
+    }
+  }
+  EXPECT_TRUE(same());
+}
+
 // All 65,536 pairs of a source byte and a weight, through every operation and blend.
 TEST_F(sprite_render, arithmetic_is_exact_for_every_byte) {
   for (int pair = 0; pair < pairs; ++pair) {
@@ -141,6 +228,9 @@ TEST_F(sprite_render, a_sprite_without_a_colour_target_draws_nothing) {
     Java_fa_ha(env, nullptr, handle(), 0, 0, 9, 9, 1, 0, 0);
     Java_fa_G(env, nullptr, handle(), 0, 0, -9, 9, 9, 1, 0, 0);
     Java_fa_o(env, nullptr, handle(), 0, 0, 0, 0, 0);
+    Java_fa_e(env, nullptr, handle(), 0, 0, 9, 0, 0, 9, 1, 0, 0);
+    Java_fa_FA(env, nullptr, handle(), 0, 0, 9, 0, 0, 9, 0, 0, 0, 0, 0);
+    Java_fa_aa(env, nullptr, handle(), 0, 0, 9, 9, 1, 0, 0);
   };
   Rasterizer_n::m_pColourBuffer = nullptr;  // the raster stage's alone, as after a target of none
   draw_all();
@@ -160,6 +250,8 @@ TEST_F(sprite_render, modes_that_do_not_exist_draw_nothing) {
     Java_fa_Y(env, nullptr, handle(), 4, 4, colourop, -1, blend);
     Java_fa_ha(env, nullptr, handle(), 4, 4, 9, 9, colourop, -1, blend);
     Java_fa_G(env, nullptr, handle(), 4, 4, -9, 9, 9, colourop, -1, blend);
+    Java_fa_e(env, nullptr, handle(), 0, 0, 9, 0, 0, 9, colourop, -1, blend);
+    Java_fa_aa(env, nullptr, handle(), 0, 0, 9, 9, colourop, -1, blend);
   }
   EXPECT_TRUE(same());
 }
@@ -177,6 +269,12 @@ TEST_F(sprite_render, zero_handles_raise) {
   EXPECT_TRUE(raised());
   Java_fa_o(env, nullptr, handle(), 0, 0, 0, 0, 0);
   EXPECT_TRUE(raised());
+  Java_fa_e(env, nullptr, 0, 0, 0, 9, 0, 0, 9, 1, 0, 0);
+  EXPECT_TRUE(raised());
+  Java_fa_FA(env, nullptr, handle(), 0, 0, 9, 0, 0, 9, 0, 0, 0, 0, 0);
+  EXPECT_TRUE(raised());
+  Java_fa_aa(env, nullptr, 0, 0, 0, 9, 9, 1, 0, 0);
+  EXPECT_TRUE(raised());
 }
 
 // Numbers at the ends of their range, in every argument: nothing outside the image or the target may be touched.
@@ -186,6 +284,10 @@ TEST_F(sprite_render, extreme_numbers_do_no_harm) {
     static constexpr int values[] = {INT_MIN, INT_MIN + 1, -70000, -1, 0, 1, 7, 70000, INT_MAX - 1, INT_MAX};
     return values[random.between(0, static_cast<int>(std::size(values)) - 1)];
   };
+  static constexpr float nan = std::numeric_limits<float>::quiet_NaN(),
+                         infinity = std::numeric_limits<float>::infinity();
+  static constexpr float extreme_floats[] = {nan, infinity, -infinity, 3e38f, -3e38f, 2147483648.0f, -70000, -1, -0.0f,
+                                             0,   1e-30f,   0.5f,      9,     30,     70000,         1e12f};
   for (int call = 0; call < 4000; ++call) {
     if (call % 100 == 0) random_target(random, 37, 21, true);
     random_sprite(random, random.between(0, 5), random.between(0, 5), false);
@@ -199,6 +301,12 @@ TEST_F(sprite_render, extreme_numbers_do_no_harm) {
     Java_fa_G(env, nullptr, handle(), x, y, extreme(), w, h, op, 1, blend);
     random_mask(random, 40, 20);
     Java_fa_o(env, nullptr, handle(), x, y, mask_handle(), extreme(), extreme());
+    Java_fa_aa(env, nullptr, handle(), x, y, w, h, op, 1, blend);
+    float c[6];
+    for (float& value : c) value = extreme_floats[random.between(0, static_cast<int>(std::size(extreme_floats)) - 1)];
+    Java_fa_e(env, nullptr, handle(), c[0], c[1], c[2], c[3], c[4], c[5], op, 1, blend);
+    Java_fa_FA(env, nullptr, handle(), c[0], c[1], c[2], c[3], c[4], c[5], 0, mask_handle(), extreme(), extreme(),
+               blend);
   }
   EXPECT_TRUE(colour.intact() && depth.intact());
 }
