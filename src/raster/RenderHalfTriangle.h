@@ -108,7 +108,7 @@ VELMARK5_LANE void fill_group(const HorizontalLine_s& line, const HalfTriangle_s
   }
 
   // Four pixels, before they meet the target.
-  std::uint32_t* const target = line.colour_row + x;
+  std::uint32_t* const target = Modes.colour_write ? line.colour_row + x : nullptr;
   Int4 pixels{};
   Channels s{};
   if constexpr (Modes.shade == ShadeMode_e::Flat) {
