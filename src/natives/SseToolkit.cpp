@@ -12,6 +12,7 @@ using namespace natives;
 
 VELMARK5_NATIVE(void) Java_ja_q(JNIEnv* env, jobject peer, jobject texture_source, jint texture_count) {
   frame(env, [&] {
+    if (texture_source != nullptr) contract::not_negative("texture_count", texture_count);
     void* place = _aligned_malloc(sizeof(toolkit), 16);
     toolkit* instance = nullptr;
     try {

@@ -5,6 +5,8 @@
 #include "maths/colourutils.h"
 #include "maths/mymath.h"
 #include "natives/se_handling.h"
+#include "texture/texturecache.h"
+#include "util/memorymanager/alignedmemory.h"
 
 toolkit* toolkit::m_pInstance = nullptr;
 
@@ -12,13 +14,50 @@ jmethodID mid_request_texture = nullptr;
 jmethodID mid_garbagecollect = nullptr;
 jmethodID mid_createshadow = nullptr;
 
-toolkit::toolkit(JNIEnv* env, jobject peer, jobject /*texture_source*/, int /*texture_count*/) {
+namespace {
+
+// The cache's way to the client.
+class toolkit_texturecache final : public texturecache {
+ public:
+  toolkit_texturecache(JNIEnv* env, jobject source, int count, toolkit& of)
+      : texturecache(env, source, count), owner(of) {}
+
+ protected:
+  bool request_texture(unsigned short id) override { return owner.request_texture(id); }
+  bool several_threads() const override { return owner.thread_count >= 2; }
+
+ private:
+  toolkit& owner;
+};
+
+texturecache* make_texturecache(JNIEnv* env, jobject source, int count, toolkit& owner) {
+  void* place = _aligned_malloc(sizeof(toolkit_texturecache), alignof(toolkit_texturecache));
+  try {
+    return new (place) toolkit_texturecache(env, source, count, owner);
+  } catch (...) {
+    _aligned_free(place);
+    throw;
+  }
+}
+
+}  // namespace
+
+toolkit::toolkit(JNIEnv* env, jobject peer, jobject texture_source, int texture_count) {
   threads.makesentinel();
   setup_se_handling(env);
   env->GetJavaVM(&vm);
   java_peer = env->NewWeakGlobalRef(peer);
   mymath::init();
   colourutils::init();
+  if (texture_source != nullptr) {
+    try {
+      textures = make_texturecache(env, texture_source, texture_count, *this);
+    } catch (...) {
+      env->DeleteWeakGlobalRef(java_peer);
+      restore_se_handling();
+      throw;
+    }
+  }
 
   jclass peer_class = env->FindClass("ja");
   mid_request_texture = env->GetMethodID(peer_class, "SA", "(S)Z");
@@ -32,6 +71,11 @@ toolkit::toolkit(JNIEnv* env, jobject peer, jobject /*texture_source*/, int /*te
 toolkit::~toolkit() {
   restore_se_handling();
   get_env()->DeleteWeakGlobalRef(java_peer);
+  if (textures != nullptr) {
+    textures->~texturecache();
+    _aligned_free(textures);
+    textures = nullptr;
+  }
 }
 
 JNIEnv* toolkit::get_env() const {
@@ -64,4 +108,14 @@ jobject toolkit::createshadow() {
   return shadow;
 }
 
-void toolkit::service(int /*time*/) {}
+void toolkit::service(int time) {
+  if (textures != nullptr) textures->service(time);
+}
+
+void toolkit::upload_texturemetrics(unsigned short id, const texturemetrics& fields) {
+  textures->upload_texturemetrics(id, fields);
+}
+
+void toolkit::upload_texture(unsigned short id, const unsigned int* pixels, const texturemetrics& fields) {
+  textures->upload_texture(id, pixels, fields);
+}

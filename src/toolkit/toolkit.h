@@ -16,6 +16,7 @@ class clippingmask;
 class DepthBuffer_c;
 class memorymanager;
 class texturecache;
+struct texturemetrics;
 struct Sprite_c;
 struct threadresource;
 
@@ -48,6 +49,10 @@ class alignas(16) toolkit {
   void service(int time);
   void quit() { quit_requested = true; }
 
+  // Into the texture cache, which must exist.
+  void upload_texturemetrics(unsigned short id, const texturemetrics& fields);
+  void upload_texture(unsigned short id, const unsigned int* pixels, const texturemetrics& fields);
+
   // --- Target (toolkit_target.cpp) ------------------------------------------------------------------------------
 
   // Makes the canvas the target, with clip rectangle and viewport over all of it, and clears it to black and far
@@ -66,6 +71,26 @@ class alignas(16) toolkit {
   void resetclipping();
   void getclipping(int* out) const;  // four ints: x0, y0, x1, y1
   void updateClippingDerived();
+
+  // --- Scene state (toolkit_scene.cpp) ---------------------------------------------------------------------------
+  //
+  // Set between passes; what depends on the values is derived at once, here and in the raster state.
+
+  void set_camera(const Matrix_c& matrix);      // world to view
+  void set_projection(const Matrix_c& matrix);  // view to clip; after the viewport, through which fog is measured
+  void set_globalambient(float level) { ambient = level; }
+  // colour: 0x00RRGGBB; front, back: multipliers on faces toward the sun and away from it; the direction of any length.
+  void set_globalsun(int colour, float front, float back, float x, float y, float z);
+  // start: distance back from the far plane at which distance fog begins; negative ones count as 0.
+  void set_fog(unsigned int colour, int start);
+  // Five integers a light: x, y, z, range, colour; one strength each, at most 1. More than four lights are cut to four.
+  void set_pointlights(int count, const int* lights, const float* strengths);
+  // level: the height of the water; range: over how much depth the fog grows to its full strength. The distance fog takes
+  // the colour at the next set_fog or set_projection.
+  void underwatermode_enable(int level, unsigned int colour, int range);
+  void underwatermode_adjust(int level, unsigned int colour, int range);
+  void underwatermode_disable();
+  void set_shadow_resolution(int value);  // rounded down to a power of two, at least 1
 
   // --- Primitives (toolkit_fill.cpp, toolkit_line.cpp, toolkit_circle.cpp, toolkit_area.cpp) --------------------
   //
@@ -148,4 +173,8 @@ class alignas(16) toolkit {
   Vector4_s pointlight_pos[4] = {};
   alignas(16) float pointlight_strength[4] = {};
   unsigned int pointlight_colour[4] = {};
+
+ private:
+  void update_viewprojection();
+  void update_distance_fog();
 };
