@@ -85,8 +85,8 @@ class alignas(16) toolkit {
   void set_fog(unsigned int colour, int start);
   // Five integers a light: x, y, z, range, colour; one strength each, at most 1. More than four lights are cut to four.
   void set_pointlights(int count, const int* lights, const float* strengths);
-  // level: the height of the water; range: over how much depth the fog grows to its full strength. The distance fog takes
-  // the colour at the next set_fog or set_projection.
+  // level: the height of the water; range: over how much depth the fog grows to its full strength. The distance fog
+  // takes the colour at the next set_fog or set_projection.
   void underwatermode_enable(int level, unsigned int colour, int range);
   void underwatermode_adjust(int level, unsigned int colour, int range);
   void underwatermode_disable();
