@@ -397,7 +397,8 @@ TEST_F(pools, growth_that_cannot_be_had_leaves_the_pool_as_it_was) {
   EXPECT_EQ(block.address, before);
   EXPECT_EQ(pool.get_size(), 90000u);
   EXPECT_EQ(pool.blocks.next, block.block);
-  EXPECT_EQ(pool.allocate(20000).address, block.block->endadr());
+  const auto more = pool.allocate(20000);  // growing may move the pool
+  EXPECT_EQ(more.address, block.block->endadr());
 
   // A tenth of nothing: growing would never end.
   for (const unsigned int size : {0u, 1u, 9u}) {
