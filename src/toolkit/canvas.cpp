@@ -291,8 +291,7 @@ void canvas::flip(int x, int y, int w, int h) {
   } else {
     binding.XPutImage(display, surface.x11()->drawable, gc, image[0], x, y, 0, 0, w, h);
   }
-  // AWT flushes its connection only every tenth of a second. Two images suffice only while the server is told of each
-  // frame at once, not of six together.
+  // AWT does not flush whenever it unlocks. A frame that stays in the connection's buffer shows with the next one.
   binding.XFlush(display);
 }
 
