@@ -114,12 +114,11 @@ public final class PresentBench {
     }
     System.out.printf(
         "%dx%d, medians of %d rounds of %d frames; per cent of \"%s\"%n", width, height, rounds, frames, BARE[EQUAL]);
-    double[] equal = rates.get(BARE[EQUAL]);
+    double equal = median(rates.get(BARE[EQUAL]));
     rates.forEach(
         (name, perSecond) -> {
-          double[] ratios = new double[rounds];
-          for (int i = 0; i < rounds; ++i) ratios[i] = 100 * perSecond[i] / equal[i];
-          System.out.printf("  %-42s %7.0f /s  %6.1f %%%n", name, median(perSecond), median(ratios));
+          double rate = median(perSecond);
+          System.out.printf("  %-42s %7.0f /s  %6.1f %%%n", name, rate, 100 * rate / equal);
         });
     toolkit.close();
     EventQueue.invokeAndWait(window::dispose);

@@ -2,6 +2,7 @@
 // failure half way gives everything back.
 #include <gtest/gtest.h>
 
+#include "support/allocation_failure.h"
 #include "support/toolkit_fixture.h"
 #include "toolkit/canvas.h"
 #include "util/exception.h"
@@ -10,6 +11,7 @@
 // The fixtures come before Xlib's macros.
 #include <dlfcn.h>
 
+#include <cerrno>
 #include <cstdlib>
 #include <memory>
 #include <set>
@@ -233,12 +235,12 @@ class canvas_test : public toolkit_fixture {
     pixels[w * h - 1] = 1;
     _aligned_free(pixels);
   }
-  template <class Body>
-  std::string state_failure(Body&& body) {
+  template <class Failure = IllegalStateException, class Body>
+  std::string failure_of(Body&& body) {
     try {
       body();
-    } catch (IllegalStateException* failure) {
-      const std::unique_ptr<IllegalStateException> owned(failure);
+    } catch (Failure* failure) {
+      const std::unique_ptr<Failure> owned(failure);
       return failure->text();
     }
     return "";
@@ -299,13 +301,21 @@ TEST_F(canvas_test, shared_memory_that_does_not_work_falls_back_and_leaves_nothi
   }
 }
 
-TEST_F(canvas_test, a_component_without_a_surface_raises_and_leaves_nothing) {
+TEST_F(canvas_test, a_component_without_a_surface_or_memory_raises_and_leaves_nothing) {
   const int weak = java.weak_references();
   for (const char* call : {"GetAWT0", "GetDrawingSurface0", "ds.Lock0", "GetInfo0", "XCreateImage0"}) {
     SCOPED_TRACE(call);
     desktop.counts.clear();
     desktop.failing = {call, "XQueryExtension0"};
-    EXPECT_NE(state_failure([&] { make(); }), "");
+    EXPECT_NE(failure_of([&] { make(); }), "");
+    EXPECT_EQ(java.weak_references(), weak);
+    desktop.expect_nothing_held();
+  }
+  for (const int buffer : {1, 2}) {
+    desktop.counts.clear();
+    desktop.failing = {"XQueryExtension0"};
+    allocation_failure::fail_memalign(buffer, ENOMEM);
+    EXPECT_EQ(failure_of<RuntimeException>([&] { make(); }), "Cannot allocate memory");
     EXPECT_EQ(java.weak_references(), weak);
     desktop.expect_nothing_held();
   }
@@ -381,14 +391,18 @@ TEST_F(canvas_test, resizing_replaces_everything_even_when_it_fails) {
   EXPECT_EQ(java.weak_references(), weak);
   desktop.counts.clear();
   desktop.failing = {"ds.Lock0"};
-  EXPECT_NE(state_failure([&] { c->resized(component, w, h); }), "");
+  EXPECT_NE(failure_of([&] { c->resized(component, w, h); }), "");
   desktop.expect_nothing_held();
   EXPECT_TRUE(c->width == 0 && c->colourbuffer == nullptr && c->depthbuffer == nullptr);
   kit().set_active_canvas(c.get());
   c->flip(0, 0, 0, 0);
   c->resized(component, w, h);
   EXPECT_TRUE(c->width == w && c->use_shm);
-  c.reset();
+  desktop.counts.clear();
+  desktop.failing = {"XQueryExtension0"};
+  c->resized(component, w, h);
+  EXPECT_FALSE(c->use_shm);
+  drop_plain(std::move(c));
   desktop.expect_nothing_held();
   EXPECT_EQ(java.weak_references(), weak - 1);
 }
