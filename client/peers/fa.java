@@ -1,8 +1,11 @@
 import java.util.Objects;
+import velmark5.BlendMode;
 import velmark5.Channel;
+import velmark5.ClippingMask;
 import velmark5.Margins;
 import velmark5.Rect;
 import velmark5.Sprite;
+import velmark5.Tint;
 
 /** Sprite. */
 final class fa extends Peer implements Sprite {
@@ -36,6 +39,14 @@ final class fa extends Peer implements Sprite {
   native void ea(long handle, int x, int y, int w, int h, int fbx, int fby) throws Exception;
 
   native void j(long handle, int fbx, int fby, int channel) throws Exception;
+
+  native void Y(long handle, int x, int y, int colourOp, int colour, int blend);
+
+  native void ha(long handle, int x, int y, int w, int h, int colourOp, int colour, int blend);
+
+  native void G(long handle, int x, int y, int z, int w, int h, int colourOp, int colour, int blend);
+
+  native void o(long handle, int x, int y, long mask, int maskX, int maskY);
 
   /** A peer with no native object yet; one of the natives above gives it one. */
   fa(ja toolkit) {
@@ -112,5 +123,42 @@ final class fa extends Peer implements Sprite {
     } catch (Exception e) {
       throw translated(e);
     }
+  }
+
+  @Override
+  public void draw(int x, int y, Tint tint, BlendMode mode) {
+    Y(handle(), x, y, tint.operation().code(), tint.colour(), mode.code());
+  }
+
+  @Override
+  public void drawScaled(Rect box, Tint tint, BlendMode mode) {
+    ha(
+        handle(),
+        box.x(),
+        box.y(),
+        box.width(),
+        box.height(),
+        tint.operation().code(),
+        tint.colour(),
+        mode.code());
+  }
+
+  @Override
+  public void drawScaled(Rect box, int depth, Tint tint, BlendMode mode) {
+    G(
+        handle(),
+        box.x(),
+        box.y(),
+        depth,
+        box.width(),
+        box.height(),
+        tint.operation().code(),
+        tint.colour(),
+        mode.code());
+  }
+
+  @Override
+  public void draw(int x, int y, ClippingMask mask, int maskX, int maskY) {
+    o(handle(), x, y, ((wa) mask).handle(), maskX, maskY);
   }
 }

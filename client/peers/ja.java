@@ -6,8 +6,11 @@ import velmark5.BlendMode;
 import velmark5.Canvas;
 import velmark5.ClippingMask;
 import velmark5.DepthBuffer;
+import velmark5.Font;
+import velmark5.Glyphs;
 import velmark5.MemoryPool;
 import velmark5.NativeLibrary;
+import velmark5.PalettedFont;
 import velmark5.Rect;
 import velmark5.Spans;
 import velmark5.Sprite;
@@ -294,6 +297,21 @@ final class ja implements Toolkit {
   @Override
   public ClippingMask createMask(MemoryPool pool, Spans spans) {
     return keep(new wa(this, own((ba) pool), spans));
+  }
+
+  @Override
+  public Font createMonoFont(MemoryPool pool, Glyphs glyphs) {
+    return keep(new m(this, own((ba) pool), glyphs));
+  }
+
+  @Override
+  public Font createSmoothFont(MemoryPool pool, Glyphs glyphs) {
+    return keep(new ea(this, own((ba) pool), glyphs));
+  }
+
+  @Override
+  public PalettedFont createPalettedFont(MemoryPool pool, Glyphs glyphs, int[] palette) {
+    return keep(new ia(this, own((ba) pool), glyphs, palette));
   }
 
   @Override

@@ -81,6 +81,58 @@ public interface Sprite extends AutoCloseable {
    */
   void captureAlpha(int frameX, int frameY, Channel channel);
 
+  /**
+   * Draws the sprite as it is, by its alpha.
+   *
+   * @param x left edge of the full image
+   * @param y top edge of the full image
+   */
+  default void draw(int x, int y) {
+    draw(x, y, Tint.NONE, BlendMode.ALPHA);
+  }
+
+  /**
+   * Draws the sprite. Like all drawing of sprites this is cut to the toolkit's clip rectangle, and does nothing without a
+   * frame.
+   *
+   * @param x left edge of the full image
+   * @param y top edge of the full image
+   * @param tint a change of colours on the way
+   * @param mode how the result combines with the frame
+   */
+  void draw(int x, int y, Tint tint, BlendMode mode);
+
+  /**
+   * Draws the sprite stretched or shrunk, nearest pixels without a filter.
+   *
+   * @param box where the full image goes
+   * @param tint a change of colours on the way
+   * @param mode how the result combines with the frame
+   */
+  void drawScaled(Rect box, Tint tint, BlendMode mode);
+
+  /**
+   * Draws the sprite stretched or shrunk, only where it is not behind what is there; depths stay. Without a depth buffer
+   * every pixel is drawn.
+   *
+   * @param box where the full image goes
+   * @param depth the sprite's depth, compared with the stored depths: 0 is at the very front
+   * @param tint a change of colours on the way
+   * @param mode how the result combines with the frame
+   */
+  void drawScaled(Rect box, int depth, Tint tint, BlendMode mode);
+
+  /**
+   * Draws the sprite by its alpha inside a shape.
+   *
+   * @param x left edge of the full image
+   * @param y top edge of the full image
+   * @param mask the shape
+   * @param maskX left edge of the shape's box
+   * @param maskY top edge of the shape's box
+   */
+  void draw(int x, int y, ClippingMask mask, int maskX, int maskY);
+
   /** Gives the pixels back. If the sprite is the target, the toolkit draws to nothing from then on. */
   @Override
   void close();

@@ -140,6 +140,35 @@ public interface Toolkit extends Painter, AutoCloseable {
   ClippingMask createMask(MemoryPool pool, Spans spans);
 
   /**
+   * Makes a font whose glyphs are on or off: the fastest kind.
+   *
+   * @param pool where it lives
+   * @param glyphs its glyphs; every byte but 0 is on
+   * @return the font; the alpha of a text's colour counts
+   */
+  Font createMonoFont(MemoryPool pool, Glyphs glyphs);
+
+  /**
+   * Makes a font with smooth edges.
+   *
+   * @param pool where it lives
+   * @param glyphs its glyphs; a byte says how much of the pixel is covered, 0 to 255
+   * @return the font; the alpha of a text's colour does not count
+   */
+  Font createSmoothFont(MemoryPool pool, Glyphs glyphs);
+
+  /**
+   * Makes a font of several colours.
+   *
+   * @param pool where it lives
+   * @param glyphs its glyphs; a byte is an index of the palette, and 0 is a hole
+   * @param palette the colours; entry 0 is not used
+   * @return the font
+   * @throws IllegalArgumentException if a glyph uses an index outside the palette
+   */
+  PalettedFont createPalettedFont(MemoryPool pool, Glyphs glyphs, int[] palette);
+
+  /**
    * Makes what one thread needs to draw.
    *
    * @return the resource

@@ -74,16 +74,6 @@ public final class Demo {
     }
   }
 
-  private static List<Scene> scenes(Toolkit toolkit, MemoryPool pool) {
-    return List.of(
-        new Sky(toolkit),
-        new Hills(toolkit),
-        new Lanterns(toolkit),
-        new Lake(toolkit),
-        new Spectrum(toolkit),
-        new Radar(toolkit, pool));
-  }
-
   private void runInWindow() throws IOException {
     java.awt.Canvas component = new java.awt.Canvas();
     component.setIgnoreRepaint(true);
@@ -157,12 +147,18 @@ public final class Demo {
   /** The loop, for whatever the frames are shown in. */
   private abstract class Show {
     private final Toolkit toolkit;
+    private final Hud hud;
     private final List<Scene> scenes;
     private Rect laidOut = new Rect(0, 0, 0, 0);
 
     Show(Toolkit toolkit) {
       this.toolkit = toolkit;
-      scenes = scenes(toolkit, toolkit.createPool(1 << 16));
+      MemoryPool pool = toolkit.createPool(1 << 17);
+      Spectrum spectrum = new Spectrum(toolkit);
+      Radar radar = new Radar(toolkit, pool);
+      hud = new Hud(toolkit, pool, spectrum, radar);
+      scenes =
+          List.of(new Sky(toolkit), new Hills(toolkit), new Lanterns(toolkit), new Lake(toolkit), spectrum, radar, hud);
     }
 
     /** Adapts the frame to what it is shown in, and returns its size. */
@@ -175,9 +171,8 @@ public final class Demo {
 
     void run() throws IOException {
       long start = System.nanoTime();
-      long reported = start;
-      long busy = 0;
-      int counted = 0;
+      Meter console = new Meter(1);
+      Meter shown = new Meter(0.5);
       while (true) {
         long began = System.nanoTime();
         // A counted run is the same in every run; else the clock leads.
@@ -189,18 +184,16 @@ public final class Demo {
         BufferedImage picture = last && options.png() != null ? toolkit.snapshot() : null;
         present();
         long done = System.nanoTime();
-        busy += done - began;
-        counted++;
-        if (done - reported >= 1_000_000_000L || last) {
+        if (console.count(began, done, last)) {
           System.out.printf(
               Locale.ROOT,
               "frame %d: %.1f frames per second, %.2f ms each%n",
               drawn,
-              counted * 1e9 / (done - reported),
-              busy / 1e6 / counted);
-          reported = done;
-          busy = 0;
-          counted = 0;
+              console.framesPerSecond(),
+              console.milliseconds());
+        }
+        if (shown.count(began, done, last)) {
+          hud.showRate(shown.framesPerSecond(), shown.milliseconds());
         }
         if (picture != null) {
           save(picture);

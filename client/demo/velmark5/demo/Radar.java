@@ -3,6 +3,7 @@ package velmark5.demo;
 import velmark5.BlendMode;
 import velmark5.ClippingMask;
 import velmark5.Colour;
+import velmark5.Font;
 import velmark5.MemoryPool;
 import velmark5.Spans;
 import velmark5.Toolkit;
@@ -98,6 +99,18 @@ final class Radar implements Scene {
         centreX - radius, centreY - radius);
     toolkit.line(centreX, centreY - radius, centreX, centreY - radius + length, faint, BlendMode.ADD, disc,
         centreX - radius, centreY - radius);
+  }
+
+  /** Letters of the four directions, cut to the glass like everything on it. */
+  void label(Font font) {
+    String letters = "ESWN";
+    for (int i = 0; i < 4; i++) {
+      String letter = letters.substring(i, i + 1);
+      double r = radius * 0.80;
+      int x = centreX + (int) Math.round(r * Math.cos(i * Math.PI / 2)) - font.width(letter) / 2;
+      int y = centreY + (int) Math.round(r * Math.sin(i * Math.PI / 2)) + font.ascent() / 3;
+      font.draw(letter, x + 1, y, Colour.withAlpha(PHOSPHOR, 170), disc, centreX - radius, centreY - radius);
+    }
   }
 
   /** Points that light up as the beam passes and fade until it comes round again. */

@@ -24,6 +24,18 @@ final class Spectrum implements Scene {
     this.toolkit = toolkit;
   }
 
+  Rect panel() {
+    return panel;
+  }
+
+  Rect plot() {
+    return plot;
+  }
+
+  Rect past() {
+    return past;
+  }
+
   @Override
   public void resize(int width, int height) {
     int unit = Math.max(1, Math.min(width, height) / 120);
@@ -31,9 +43,11 @@ final class Spectrum implements Scene {
     int wide = Math.max(40, width * 29 / 100);
     int tall = Math.max(40, height * 31 / 100);
     panel = new Rect(margin, height - margin - tall, wide, tall);
-    int inner = wide - 4 * unit;
+    // Room for upright labels at the left.
+    int indent = Math.max(9, 2 * unit + height / 64);
+    int inner = wide - indent - 2 * unit;
     int plotTall = (tall - 6 * unit) * 55 / 100;
-    plot = new Rect(panel.x() + 2 * unit, panel.y() + 2 * unit, inner, plotTall);
+    plot = new Rect(panel.x() + indent, panel.y() + 2 * unit, inner, plotTall);
     past = Rect.between(plot.x(), plot.bottom() + 2 * unit, plot.right(), panel.bottom() - 2 * unit)
         .intersect(new Rect(0, 0, width, height));
     levels = new double[inner];
