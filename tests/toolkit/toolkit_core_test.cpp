@@ -317,17 +317,19 @@ TEST_F(toolkit_core, wrong_calls_raise_and_change_nothing) {
 }
 
 #if defined(__i386__)
+[[gnu::noipa]] void divide_by_three(volatile long double& out, long double number) { out = number / 3; }
+
 TEST_F(toolkit_core, extended_precision_does_not_depend_on_the_runtime) {
-  const auto third = [] { return 1.0L / static_cast<long double>(kit().thread_count + 2); };
-  const long double exact = third();
+  volatile long double exact, cut, inside;
+  divide_by_three(exact, 1);
   const unsigned short runtimes = 0x27F;  // double precision
-  asm volatile("fldcw %0" ::"m"(runtimes));
-  volatile long double cut = third();
-  volatile long double inside = natives::frame(env, third);
+  asm volatile("fldcw %0" ::"m"(runtimes) : "memory");
+  divide_by_three(cut, 1);
+  natives::frame(env, [&] { divide_by_three(inside, 1); });
   unsigned short after = 0;
-  asm volatile("fnstcw %0" : "=m"(after));
+  asm volatile("fnstcw %0" : "=m"(after)::"memory");
   const unsigned short usual = 0x37F;
-  asm volatile("fldcw %0" ::"m"(usual));
+  asm volatile("fldcw %0" ::"m"(usual) : "memory");
   EXPECT_NE(cut, exact);
   EXPECT_EQ(inside, exact);
   EXPECT_EQ(after, runtimes);
