@@ -438,7 +438,9 @@ TEST_F(pools, blocks_keep_their_bytes_when_growth_moves_them_to_another_phase) {
     allocation_failure::move_realloc(true, phase);
     pool.resizepool();
     allocation_failure::move_realloc(false);
+#ifndef __SANITIZE_ADDRESS__  // Its heap has few phases, and may not have this one.
     EXPECT_EQ(reinterpret_cast<std::uintptr_t>(pool.base) % 128, phase);
+#endif
     pool.defragment();
     for (int i = 0; i < 40; ++i) {
       const allocatedmemory& block = *handles[static_cast<std::size_t>(i)].block;
