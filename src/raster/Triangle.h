@@ -37,6 +37,12 @@ struct alignas(16) VertexColour_s {
   std::uint16_t channels[4];
 };
 
+// The channels of a colour word, each * 256.
+inline VertexColour_s vertex_colour(std::uint32_t colour) {
+  const auto channel = [colour](int byte) { return static_cast<std::uint16_t>((colour >> (8 * byte) & 0xFF) << 8); };
+  return {{channel(0), channel(1), channel(2), channel(3)}};
+}
+
 struct alignas(16) Triangle_s {
   Vector4_s vertex[3];                     // screen x, screen y (pixels), screen depth; w is not read
   VertexColour_s colour[3];                // all shade modes but Mask and Flat

@@ -92,7 +92,7 @@ class alignas(16) toolkit {
   void underwatermode_disable();
   void set_shadow_resolution(int value);  // rounded down to a power of two, at least 1
 
-  // --- Primitives (toolkit_fill.cpp, toolkit_line.cpp, toolkit_circle.cpp, toolkit_area.cpp) --------------------
+  // --- Primitives (toolkit_fill.cpp, toolkit_line*.cpp, toolkit_circle.cpp, toolkit_area.cpp) --------------------
   //
   // Pixels are target pixels; everything is clipped but the area copies. mode: 0 opaque, 1 alpha blend, 2 additive; any
   // other throws IllegalArgumentException*. Without a colour buffer nothing is drawn.
@@ -108,6 +108,10 @@ class alignas(16) toolkit {
             int mask_y);
   // Plots one pixel where the world point (x0, y0, z0) is on screen; the second point is not looked at.
   void line(int x0, int y0, int z0, int x1, int y1, int z1, unsigned int colour, unsigned int mode);
+  // A line of `thickness` pixels, displaced by the corner of the clip rectangle. Blends in mode 1; any other mode draws
+  // the colour word as it stands. The resource is not used and may be null.
+  void line_thick(threadresource* resource, int x0, int y0, int x1, int y1, unsigned int colour, int thickness,
+                  unsigned int mode);
   void circle_fill(int x, int y, int z, int radius, unsigned int colour, unsigned int mode);
   // Draws nothing, on purpose.
   void circle_outline(int x, int y, int z, int radius, unsigned int colour, unsigned int mode);
