@@ -56,6 +56,7 @@ VELMARK5_LANE Float4 min(Float4 a, Float4 b) { return {_mm_min_ps(a.v, b.v)}; }
 VELMARK5_LANE Float4 reciprocal_estimate(Float4 a) { return {_mm_rcp_ps(a.v)}; }
 VELMARK5_LANE Float4 reciprocal_root_estimate(Float4 a) { return {_mm_rsqrt_ps(a.v)}; }
 VELMARK5_LANE Int4 less(Float4 a, Float4 b) { return {_mm_castps_si128(_mm_cmplt_ps(a.v, b.v))}; }
+VELMARK5_LANE Int4 equal(Float4 a, Float4 b) { return {_mm_castps_si128(_mm_cmpeq_ps(a.v, b.v))}; }
 VELMARK5_LANE Int4 less_equal(Float4 a, Float4 b) { return {_mm_castps_si128(_mm_cmple_ps(a.v, b.v))}; }
 
 // Picks lanes by number, the first for lane 0.

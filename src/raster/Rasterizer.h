@@ -25,6 +25,8 @@ struct Cliprect_s {
 // What a cleared depth buffer holds: about 3.4e38.
 inline constexpr float far_depth = std::bit_cast<float>(0x7F7FC99Eu);
 
+// Not exported: every triangle reads them, without the detour of a symbol that another library could replace.
+#pragma GCC visibility push(hidden)
 extern unsigned int* m_pColourBuffer;  // 0xAARRGGBB words; null without a colour target
 extern float* m_pDepthBuffer;          // null without a depth target
 extern int m_ScreenPitch;              // row length of both, in pixels
@@ -48,6 +50,7 @@ extern Viewport_s m_Viewport;
 extern Vector4_s m_ViewportMul;  // from projected to screen coordinates: scale
 extern Vector4_s m_ViewportAdd;  // and offset
 extern Cliprect_s m_Cliprect;
+#pragma GCC visibility pop
 
 // Stores the viewport and derives m_ViewportMul, m_ViewportAdd and m_TriangleCuller from it.
 void SetViewport(const Viewport_s& viewport);

@@ -6,6 +6,7 @@
 // as u/z and v/z, linear on the screen, and are multiplied back by the pixel's depth: no division at a pixel.
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -176,9 +177,10 @@ VELMARK5_LANE void RenderHLine(HorizontalLine_s& line, const HalfTriangle_s& hal
   std::ptrdiff_t x = line.start - static_cast<std::ptrdiff_t>(line.before);
   const std::ptrdiff_t last = x + static_cast<std::ptrdiff_t>((line.before + width - 1) & ~std::size_t{3});
   const std::size_t tail = (line.before + width) & 3;
+  const std::size_t cut = 4 - std::min<std::size_t>(line.before + width, 4);
 
   // The first and the last group share one masked body, the groups between have their own without a mask.
-  Int4 mask = load(UnalignedMasks[1][line.before]) & load(RightClippingMasks[x == last ? (4 - tail) & 3 : 0]);
+  Int4 mask = load(UnalignedMasks[1][line.before]) & load(RightClippingMasks[cut]);
   for (;;) {
     fill_group<Modes, true>(line, half, x, mask);
     if (x == last) break;
@@ -201,7 +203,7 @@ VELMARK5_LANE void start_words(RunningWords& running, SSEMath::Word8 edges, SSEM
   const Int4 left = integers_low(edges);
   const Float4 step = to_float(integers_high(edges) - left) * reciprocal_width;
   Word8 first = twice_low(edges);
-  if (skip != 0) {
+  if (skip != 0) [[unlikely]] {
     const Float4 value = to_float(left) + step * splat(static_cast<float>(skip));
     first = unsigned_words(value, value);
   }
@@ -279,11 +281,12 @@ void RenderHalfTriangle_c<Shade, AddressU, AddressV, TransformTexCoords, Fog, Bl
         if constexpr (Modes.runs_depth()) {
           const Float4 left = shuffle<0, 1, 0, 1>(edge, texcoord);
           const Float4 step = (shuffle<2, 3, 2, 3>(edge, texcoord) - left) * reciprocal_width;
-          Float4 first = left + splat(static_cast<float>(skip)) * step;
-          if (skip != 0) {
-            // The first depth in extended precision. Without a skip both ways give the same.
+          Float4 first = left;
+          if (skip != 0) [[unlikely]] {
+            // The depth in extended precision, the coordinates in float.
             const long double z =
                 static_cast<long double>(lane0(broadcast<1>(step))) * skip + lane0(broadcast<1>(left));
+            first = left + splat(static_cast<float>(skip)) * step;
             first = shuffle<0, 0, 2, 3>(splat(static_cast<float>(z)), first);
           }
           first = first - load(BackToGroup[line.before]) * step;

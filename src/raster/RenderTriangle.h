@@ -50,6 +50,11 @@ VELMARK5_LANE WordEdges word_edges(SSEMath::Word8 top_middle, const FloatSteps& 
 // The weights of textures 0 and 1 at each vertex; texture 2 has what they leave of 65535.
 alignas(16) inline constexpr float VertexWeights[3][4] = {{65535, 0, 0, 0}, {0, 65535, 0, 0}, {0, 0, 0, 0}};
 
+// Whether the left and the right x of an edge record are the same.
+VELMARK5_LANE bool edges_meet(SSEMath::Float4 edge) {
+  return (SSEMath::lane_bits(SSEMath::equal(edge, SSEMath::shuffle<2, 3, 0, 1>(edge))) & 1) != 0;
+}
+
 template <ShadeMode_e Shade, TexAddressMode_e AddressU, TexAddressMode_e AddressV, bool TransformTexCoords,
           FogMode_e Fog, BlendMode_e Blend, bool ColourKey, bool LightMap, bool DepthWrite, bool ColourWrite,
           bool DepthTest>
@@ -222,7 +227,23 @@ void RenderTriangle(const Triangle_s& triangle) {
     start_words(colour, half.colour, half.colourstep);
   }
 
-  if (has_upper) Filler::RenderHalfTriangle(half);
+  if (has_upper) {
+    // The row of the top vertex itself has no pixels: on to the next.
+    if (edges_meet(load(half.edge))) {
+      half.y += 1;
+      half.rows -= 1;
+      store(half.edge, load(half.edge) + load(half.edgestep));
+      if constexpr (coloured) store(half.colour, load(half.colour) + load(half.colourstep));
+      if constexpr (coloured && textured && Fog != FogMode_e::None) {
+        store(half.fogadd, load(half.fogadd) + load(half.fogaddstep));
+      }
+      if constexpr (textured) store(half.texcoord, load(half.texcoord) + load(half.texcoordstep));
+      if constexpr (Shade == ShadeMode_e::Blended) {
+        store(half.blendweight, load(half.blendweight) + load(half.blendweightstep));
+      }
+    }
+    if (half.rows > 0) Filler::RenderHalfTriangle(half);
+  }
   if (rows_lower <= 0) return;
 
   // The carried edge goes on with its running values.

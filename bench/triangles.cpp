@@ -1,0 +1,183 @@
+// Triangles, by instance and size, beside llvmpipe on the same scenes. Times are of drawing alone, clearing is left
+// out; both sides begin with plain vertices, and both write and test depth.
+#include <benchmark/benchmark.h>
+
+#include <algorithm>
+#include <chrono>
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "mesa_peer.h"
+#include "raster/Rasterizer.h"
+#include "raster/Triangle.h"
+#include "triangle_scene.h"
+
+namespace {
+
+using namespace Rasterizer_n;
+using triangle_scene::kind;
+
+constexpr auto wrap = TexAddressMode_e::Wrap, ground = TexAddressMode_e::GroundWrap;
+
+using render_function = void (*)(const Triangle_s&);
+
+constexpr render_function instances[] = {
+    &RenderTriangle<ShadeMode_e::Flat, ground, ground, false, FogMode_e::None, BlendMode_e::Opaque, false, false, true,
+                    false, true>,
+    &RenderTriangle<ShadeMode_e::Smooth, ground, ground, false, FogMode_e::None, BlendMode_e::Opaque, false, false,
+                    true, true, true>,
+    &RenderTriangle<ShadeMode_e::Textured, wrap, wrap, false, FogMode_e::None, BlendMode_e::Opaque, false, false, true,
+                    true, true>,
+    &RenderTriangle<ShadeMode_e::Textured, wrap, wrap, false, FogMode_e::Distance, BlendMode_e::Opaque, false, false,
+                    true, true, true>,
+    &RenderTriangle<ShadeMode_e::Textured, wrap, wrap, false, FogMode_e::None, BlendMode_e::ConstantAlpha, false, false,
+                    true, true, true>,
+    &RenderTriangle<ShadeMode_e::Textured, wrap, wrap, false, FogMode_e::None, BlendMode_e::PixelAlpha, false, false,
+                    true, true, true>,
+    &RenderTriangle<ShadeMode_e::Blended, ground, ground, false, FogMode_e::None, BlendMode_e::Opaque, false, false,
+                    true, true, true>,
+    &RenderTriangle<ShadeMode_e::Textured, ground, ground, false, FogMode_e::None, BlendMode_e::Opaque, false, true,
+                    true, true, true>,
+};
+
+// The target, the textures and one scene.
+class scene {
+ public:
+  scene(kind what, int size)
+      : what_(what), size_(size), triangles_(triangle_scene::make(size, what == kind::textured_translucent)) {
+    // Whole cache lines, as a canvas has them.
+    colour_ = aligned(colour_memory_);
+    depth_ = aligned(depth_memory_);
+    for (int i = 0; i < 3; ++i) {
+      for (int v = 0; v < 128; ++v) {
+        for (int u = 0; u < 128; ++u) textures_[i][u + 256 * v] = triangle_scene::texel(i, u, v);
+      }
+    }
+    for (int v = 0; v < 128; ++v) {
+      for (int u = 0; u < 128; ++u) light_map_[static_cast<std::size_t>(u + 256 * v)] = triangle_scene::light(u, v);
+    }
+    m_pColourBuffer = colour_;
+    m_pDepthBuffer = depth_;
+    m_ScreenPitch = triangle_scene::width;
+    SetViewport({0, 0, triangle_scene::width, triangle_scene::height, 0, 1});
+    SetCliprect({0, 0, triangle_scene::width, triangle_scene::height});
+    RecomputeDistanceFogParams(0.5f, 0x999980);
+  }
+
+  void clear() {
+    std::fill_n(colour_, pixels, 0u);
+    std::fill_n(depth_, pixels, far_depth);
+  }
+
+  // Makes a Triangle_s of each triangle's vertices, as a mesh renderer does, and draws it.
+  void draw(std::size_t step = 1) {
+    const render_function render = instances[static_cast<int>(what_)];
+    Triangle_s t;
+    for (int i = 0; i < 3; ++i) t.texture[i] = textures_[i].data();
+    t.lightmap = light_map_.data();
+    t.lightmapshift = 0;
+    t.alpha = 128 * 0x10001;
+    t.flatcolour = 0;
+    for (std::size_t n = 0; n < count(); n += step) {
+      for (std::size_t i = 0; i < 3; ++i) {
+        const triangle_scene::vertex& v = triangles_[n][i];
+        t.vertex[i] = {v.x, v.y, v.z, 1};
+        t.colour[i] = vertex_colour(v.colour);
+        t.texcoord[i] = {v.u, v.v, 0, 0};
+      }
+      render(t);
+    }
+  }
+
+  std::size_t count() const { return triangles_.size(); }
+
+  long covered() {
+    clear();
+    draw(triangle_scene::sparse_step(size_, count()));
+    return static_cast<long>(pixels) - std::count(depth_, depth_ + pixels, far_depth);
+  }
+
+  static constexpr std::size_t pixels = std::size_t{triangle_scene::width} * triangle_scene::height;
+
+ private:
+  template <class T>
+  static T* aligned(std::vector<T>& memory) {
+    memory.resize(pixels + 16);
+    return reinterpret_cast<T*>((reinterpret_cast<std::uintptr_t>(memory.data()) + 63) & ~std::uintptr_t{63});
+  }
+
+  kind what_;
+  int size_;
+  std::vector<triangle_scene::triangle> triangles_;
+  std::vector<unsigned int> colour_memory_;
+  std::vector<float> depth_memory_;
+  unsigned int* colour_;
+  float* depth_;
+  std::vector<std::uint32_t> textures_[3] = {std::vector<std::uint32_t>(256 * 128),
+                                             std::vector<std::uint32_t>(256 * 128),
+                                             std::vector<std::uint32_t>(256 * 128)};
+  std::vector<std::uint8_t> light_map_ = std::vector<std::uint8_t>(256 * 128);
+};
+
+void report(benchmark::State& state, int size, std::size_t count) {
+  const double triangles = static_cast<double>(state.iterations()) * static_cast<double>(count);
+  state.counters["ns/px"] =
+      benchmark::Counter(triangles * size / 1e9, benchmark::Counter::kIsRate | benchmark::Counter::kInvert);
+  state.counters["tri/s"] = benchmark::Counter(triangles, benchmark::Counter::kIsRate);
+}
+
+void draw_here(benchmark::State& state, kind what, int size) {
+  scene s(what, size);
+  for (auto _ : state) {
+    s.clear();
+    const auto begin = std::chrono::steady_clock::now();
+    s.draw();
+    state.SetIterationTime(std::chrono::duration<double>(std::chrono::steady_clock::now() - begin).count());
+  }
+  report(state, size, s.count());
+}
+
+mesa_peer& peer(int vector_width) {
+  static mesa_peer narrow(128), wide(256);
+  return vector_width == 128 ? narrow : wide;
+}
+
+void draw_with_mesa(benchmark::State& state, kind what, int size, int vector_width) {
+  mesa_peer& mesa = peer(vector_width);
+  // Both must cover the same pixels, or the figures say nothing.
+  const long ours = scene(what, size).covered();
+  const mesa_peer::result theirs = mesa.draw(what, size, true);
+  if (theirs.seconds < 0) return state.SkipWithError("OSMesa has no llvmpipe");
+  if (std::abs(ours - theirs.covered) * 100 > theirs.covered) {
+    return state.SkipWithError(
+        ("covers " + std::to_string(theirs.covered) + " pixels, not " + std::to_string(ours)).c_str());
+  }
+  for (auto _ : state) state.SetIterationTime(mesa.draw(what, size, false).seconds);
+  report(state, size, 2000000 / static_cast<std::size_t>(size));
+}
+
+const bool registered = [] {
+  for (int k = 0; k < 8; ++k) {
+    for (const int size : triangle_scene::sizes) {
+      const kind what{k};
+      const std::string name =
+          std::string("triangles/") + triangle_scene::names[k] + "/" + std::to_string(size) + "px/";
+      const auto add = [](const std::string& full, auto function) {
+        benchmark::RegisterBenchmark(full.c_str(), function)
+            ->UseManualTime()
+            ->Unit(benchmark::kMillisecond)
+            ->MinTime(0.1);
+      };
+      add(name + "velmark5", [=](benchmark::State& state) { draw_here(state, what, size); });
+      for (const int bits : {128, 256}) {
+        add(name + "llvmpipe" + std::to_string(bits),
+            [=](benchmark::State& state) { draw_with_mesa(state, what, size, bits); });
+      }
+    }
+  }
+  return true;
+}();
+
+}  // namespace
