@@ -6,7 +6,6 @@
 #include <sys/prctl.h>
 #include <unistd.h>
 
-#include <chrono>
 #include <cstddef>
 #include <cstdio>
 #include <cstdlib>
@@ -62,7 +61,7 @@ class renderer {
     const std::size_t count = vertices_.size() / 3;
     glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
     glFinish();
-    const auto begin = std::chrono::steady_clock::now();
+    const double begin = triangle_scene::thread_seconds();
     if (r.count_pixels) {
       for (std::size_t i = 0; i < count; i += triangle_scene::sparse_step(r.size, count)) {
         glDrawArrays(GL_TRIANGLES, static_cast<GLint>(i * 3), 3);
@@ -71,14 +70,14 @@ class renderer {
       glDrawArrays(GL_TRIANGLES, 0, static_cast<GLsizei>(count * 3));
     }
     glFinish();
-    const std::chrono::duration<double> seconds = std::chrono::steady_clock::now() - begin;
+    const double seconds = triangle_scene::thread_seconds() - begin;
     long covered = 0;
     if (r.count_pixels) {
       std::vector<float> depths(frame_.size());
       glReadPixels(0, 0, triangle_scene::width, triangle_scene::height, GL_DEPTH_COMPONENT, GL_FLOAT, depths.data());
       for (const float d : depths) covered += d != 1;
     }
-    return {seconds.count(), covered};
+    return {seconds, covered};
   }
 
  private:

@@ -12,7 +12,8 @@ class mesa_peer {
   mesa_peer& operator=(const mesa_peer&) = delete;
 
   struct result {
-    double seconds;  // from the draw call until everything is drawn, clearing not counted; negative: no such renderer
+    double seconds;  // of processor time, from the draw call until everything is drawn, clearing not counted; negative:
+                     // no such renderer
     long covered;    // pixels whose depth has changed
   };
   // Clears, then draws the scene's triangles; for counting pixels, only the sparse ones.

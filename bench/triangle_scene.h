@@ -2,6 +2,8 @@
 // area, wholly inside the target. They come in patches of neighbours, as the triangles of a mesh do.
 #pragma once
 
+#include <time.h>
+
 #include <algorithm>
 #include <array>
 #include <cmath>
@@ -28,6 +30,13 @@ enum class kind {
 
 inline constexpr const char* names[] = {"depth_only",           "smooth",      "textured",       "textured_fog",
                                         "textured_translucent", "pixel_alpha", "three_textures", "light_map"};
+
+// Processor time of this thread in seconds: both renderers draw on one thread, and others use the machine too.
+inline double thread_seconds() {
+  timespec t;
+  clock_gettime(CLOCK_THREAD_CPUTIME_ID, &t);
+  return static_cast<double>(t.tv_sec) + static_cast<double>(t.tv_nsec) * 1e-9;
+}
 
 struct vertex {
   float x, y, z;         // pixels, and depth from 0 to 1

@@ -3,7 +3,6 @@
 #include <benchmark/benchmark.h>
 
 #include <algorithm>
-#include <chrono>
 #include <cstdint>
 #include <memory>
 #include <string>
@@ -132,9 +131,9 @@ void draw_here(benchmark::State& state, kind what, int size) {
   scene s(what, size);
   for (auto _ : state) {
     s.clear();
-    const auto begin = std::chrono::steady_clock::now();
+    const double begin = triangle_scene::thread_seconds();
     s.draw();
-    state.SetIterationTime(std::chrono::duration<double>(std::chrono::steady_clock::now() - begin).count());
+    state.SetIterationTime(triangle_scene::thread_seconds() - begin);
   }
   report(state, size, s.count());
 }

@@ -105,7 +105,11 @@ VELMARK5_LANE void fill_group(const HorizontalLine_s& line, const HalfTriangle_s
   if constexpr (Modes.depth_test) {
     const Int4 passes = less_equal(line.z.value, load(line.depth_row + x));
     mask = Masked ? mask & passes : passes;
-    if (lane_bits(mask) == 0) return;
+    // A group that fails costs no more. Only the masked groups of plain triangles go on: they cost little more than a
+    // branch that is taken for every other small triangle.
+    if constexpr (!Masked || Modes.textured()) {
+      if (lane_bits(mask) == 0) return;
+    }
   }
 
   // Four pixels, before they meet the target.

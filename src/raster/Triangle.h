@@ -8,6 +8,7 @@
 #pragma once
 
 #include <cstdint>
+#include <cstring>
 
 #include "maths/Vector4.h"
 
@@ -37,10 +38,14 @@ struct alignas(16) VertexColour_s {
   std::uint16_t channels[4];
 };
 
-// The channels of a colour word, each * 256.
+// The channels of a colour word, each * 256. Written as one word of 64 bits, as setup reads it.
 inline VertexColour_s vertex_colour(std::uint32_t colour) {
-  const auto channel = [colour](int byte) { return static_cast<std::uint16_t>((colour >> (8 * byte) & 0xFF) << 8); };
-  return {{channel(0), channel(1), channel(2), channel(3)}};
+  std::uint64_t channels = colour;
+  channels = (channels | channels << 16) & 0x0000FFFF0000FFFF;
+  channels = (channels << 8 | channels << 16) & 0xFF00FF00FF00FF00;
+  VertexColour_s result;
+  std::memcpy(result.channels, &channels, sizeof result.channels);
+  return result;
 }
 
 struct alignas(16) Triangle_s {
