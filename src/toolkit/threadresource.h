@@ -29,6 +29,8 @@ struct alignas(16) threadresource : linkable {
   Vector4_s vertices[max_vertices];         // transformed positions of a model or tile
   unsigned int vertex_words[max_vertices];  // a word per vertex, of the same
 
+  unsigned char vertex_flags[max_vertices];  // culling flags of the vertices
+
   // Scratch of the shared lighting of models: two tables, each behind its 16-byte header.
   alignas(16) unsigned short light_key_marker[8];  // marker, then counters
   Vector4_s light_table[light_table_vectors];

@@ -1,0 +1,13 @@
+// What the client promises of a mesh: counts within their limits, arrays as long as their counts, and every number in
+// them (vertices, faces, labels, mappings, textures) one that exists.
+#pragma once
+
+struct mesh_views;
+class toolkit;
+
+namespace mesh_contract {
+
+// Raises for the first broken promise, naming the argument.
+void check(const mesh_views& mesh, const toolkit& scene);
+
+}  // namespace mesh_contract
