@@ -9,6 +9,9 @@ import velmark5.DepthBuffer;
 import velmark5.Font;
 import velmark5.Glyphs;
 import velmark5.MemoryPool;
+import velmark5.Mesh;
+import velmark5.Model;
+import velmark5.ModelSettings;
 import velmark5.NativeLibrary;
 import velmark5.PalettedFont;
 import velmark5.Rect;
@@ -312,6 +315,11 @@ final class ja implements Toolkit {
   @Override
   public PalettedFont createPalettedFont(MemoryPool pool, Glyphs glyphs, int[] palette) {
     return keep(new ia(this, own((ba) pool), glyphs, palette));
+  }
+
+  @Override
+  public Model createModel(MemoryPool pool, Mesh mesh, ModelSettings settings) {
+    return keep(new h(this, own((ba) pool), mesh, settings));
   }
 
   @Override

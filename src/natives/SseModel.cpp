@@ -1,6 +1,7 @@
 // Natives of SseModel ("h"): lifecycle, state and bounds. Building is in SseModel_build.cpp.
 #include "model/model.h"
 
+#include "natives/mesh_contract.h"
 #include "natives/native.h"
 #include "util/memorymanager/alignedmemory.h"
 
@@ -8,7 +9,11 @@ using namespace natives;
 
 namespace {
 
-model& model_of(JNIEnv* env, jobject peer) { return contract::object(objconvert::get_model(env, peer)); }
+model& model_of(JNIEnv* env, jobject peer) {
+  model& mesh = contract::object(objconvert::get_model(env, peer));
+  mesh_contract::has_storage(mesh);
+  return mesh;
+}
 
 }  // namespace
 

@@ -3,6 +3,7 @@
 
 #include "maths/Matrix.h"
 #include "model/model.h"
+#include "natives/mesh_contract.h"
 #include "natives/native.h"
 #include "toolkit/threadresource.h"
 
@@ -13,6 +14,7 @@ Java_a_wa(JNIEnv* env, jobject, jlong resource, jobject mesh, jfloatArray matrix
   frame(env, [&] {
     auto& scratch = from_handle<threadresource>(resource);
     model& drawn = contract::object(objconvert::get_model(env, mesh));
+    mesh_contract::has_storage(drawn);
     contract::not_null(matrix);
     contract::array_is("matrix", array_length(env, matrix), 16);
     if (result != nullptr) contract::array_holds("result", array_length(env, result), 6);

@@ -149,4 +149,10 @@ void check(const mesh_views& mesh, const toolkit& scene) {
   check_billboards_and_labels(mesh, scene);
 }
 
+void has_storage(const model& mesh) {
+  if (contract::checked && mesh.vpos.block != nullptr && mesh.vpos.address == nullptr) {
+    contract::fail_state("model: its pool is gone");
+  }
+}
+
 }  // namespace mesh_contract

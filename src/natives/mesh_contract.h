@@ -3,11 +3,15 @@
 #pragma once
 
 struct mesh_views;
+class model;
 class toolkit;
 
 namespace mesh_contract {
 
 // Raises for the first broken promise, naming the argument.
 void check(const mesh_views& mesh, const toolkit& scene);
+
+// Raises for a model whose pool is gone.
+void has_storage(const model& mesh);
 
 }  // namespace mesh_contract

@@ -62,6 +62,17 @@ public interface Toolkit extends Painter, AutoCloseable {
   Canvas createCanvas(Component component, int width, int height);
 
   /**
+   * Makes a model from a mesh.
+   *
+   * @param pool where its arrays live
+   * @param mesh the mesh; it is copied
+   * @param settings how it is built
+   * @return the model
+   * @throws IllegalArgumentException if a material's texture has no metrics, or a mapping's vertex does not exist
+   */
+  Model createModel(MemoryPool pool, Mesh mesh, ModelSettings settings);
+
+  /**
    * Makes an empty sprite.
    *
    * @param width columns, not negative
