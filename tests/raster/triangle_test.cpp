@@ -23,6 +23,13 @@ using namespace Rasterizer_n;
 
 namespace {
 
+// Random frames per instance; sanitizers make each many times as long.
+#if defined(__SANITIZE_THREAD__) || defined(__SANITIZE_ADDRESS__)
+constexpr int frames = 3;
+#else
+constexpr int frames = 24;
+#endif
+
 oracle::TriangleModes modes_of(const TriangleInstance& i) {
   return {i.shade, i.addr_u, i.transform, i.fog, i.blend, i.key, i.lightmap, i.dwrite, i.cwrite, i.dtest};
 }
@@ -417,7 +424,7 @@ TEST_F(TriangleTest, EveryInstanceDrawsWhatTheSlowRendererDraws) {
     const oracle::TriangleModes modes = modes_of(i);
     Scene scene(++seed, materials);
     bool instance_changed = false;
-    for (int frame = 0; frame < 24; ++frame) {
+    for (int frame = 0; frame < frames; ++frame) {
       const int width = scene.random.between(20, 75);
       const int height = scene.random.between(10, 40);
       Targets targets(width, height);
