@@ -48,6 +48,34 @@ final class fa extends Peer implements Sprite {
 
   native void o(long handle, int x, int y, long mask, int maskX, int maskY);
 
+  native void e(
+      long handle,
+      float x0,
+      float y0,
+      float x1,
+      float y1,
+      float x2,
+      float y2,
+      int colourOp,
+      int colour,
+      int blend);
+
+  native void FA(
+      long handle,
+      float x0,
+      float y0,
+      float x1,
+      float y1,
+      float x2,
+      float y2,
+      int unused,
+      long mask,
+      int maskX,
+      int maskY,
+      int blend);
+
+  native void aa(long handle, int x, int y, int w, int h, int colourOp, int colour, int blend);
+
   /** A peer with no native object yet; one of the natives above gives it one. */
   fa(ja toolkit) {
     super(toolkit);
@@ -160,5 +188,45 @@ final class fa extends Peer implements Sprite {
   @Override
   public void draw(int x, int y, ClippingMask mask, int maskX, int maskY) {
     o(handle(), x, y, ((wa) mask).handle(), maskX, maskY);
+  }
+
+  @Override
+  public void drawAcross(
+      float x0, float y0, float x1, float y1, float x2, float y2, Tint tint, BlendMode mode) {
+    e(handle(), x0, y0, x1, y1, x2, y2, tint.operation().code(), tint.colour(), mode.code());
+  }
+
+  @Override
+  public void drawAcross(
+      float x0,
+      float y0,
+      float x1,
+      float y1,
+      float x2,
+      float y2,
+      ClippingMask mask,
+      int maskX,
+      int maskY,
+      BlendMode mode) {
+    if (mode == BlendMode.ADD) {
+      throw new IllegalArgumentException("mode: a masked sprite cannot be added");
+    }
+    FA(handle(), x0, y0, x1, y1, x2, y2, 0, ((wa) mask).handle(), maskX, maskY, mode.code());
+  }
+
+  @Override
+  public void drawTiled(Rect area, Tint tint, BlendMode mode) {
+    if (fullWidth() <= 0 || fullHeight() <= 0) {
+      throw new IllegalArgumentException("sprite: " + fullWidth() + "x" + fullHeight() + " cannot fill an area");
+    }
+    aa(
+        handle(),
+        area.x(),
+        area.y(),
+        area.width(),
+        area.height(),
+        tint.operation().code(),
+        tint.colour(),
+        mode.code());
   }
 }

@@ -1,5 +1,6 @@
 import java.awt.Component;
 import java.util.LinkedHashSet;
+import java.util.List;
 import java.util.Objects;
 import java.util.Set;
 import velmark5.BlendMode;
@@ -8,17 +9,23 @@ import velmark5.ClippingMask;
 import velmark5.DepthBuffer;
 import velmark5.Font;
 import velmark5.Glyphs;
+import velmark5.Matrix;
 import velmark5.MemoryPool;
 import velmark5.Mesh;
 import velmark5.Model;
 import velmark5.ModelSettings;
 import velmark5.NativeLibrary;
 import velmark5.PalettedFont;
+import velmark5.PointLight;
 import velmark5.Rect;
 import velmark5.Spans;
 import velmark5.Sprite;
+import velmark5.Sun;
+import velmark5.TextureMetrics;
+import velmark5.TextureSource;
 import velmark5.ThreadResource;
 import velmark5.Toolkit;
+import velmark5.Water;
 
 /** Toolkit. Knows what it made, and what the library's pointers stand on, so that neither outlives the other. */
 final class ja implements Toolkit {
@@ -39,6 +46,7 @@ final class ja implements Toolkit {
   private int width;
   private int height;
 
+  private TextureSource textures;
   private ba ownPool;
   private Runnable pressureListener;
   private boolean collecting;
@@ -107,22 +115,159 @@ final class ja implements Toolkit {
 
   native void d(long sprite, long depth);
 
-  ja() {
+  native void V(
+      short id,
+      short averageHsl,
+      int alphaKind,
+      byte lightingKind,
+      byte attributeA,
+      int attributeB,
+      boolean attributeC,
+      byte greyBlend,
+      byte brighten,
+      byte scrollU,
+      byte scrollV,
+      boolean flatColour,
+      boolean doNotDraw,
+      boolean attributeD,
+      boolean wrapU,
+      boolean wrapV,
+      byte attributeE,
+      boolean attributeF,
+      boolean attributeG,
+      int attributeH);
+
+  native void F(
+      short id,
+      int[] pixels,
+      short averageHsl,
+      int alphaKind,
+      byte lightingKind,
+      byte attributeA,
+      int attributeB,
+      boolean attributeC,
+      byte greyBlend,
+      byte brighten,
+      byte scrollU,
+      byte scrollV,
+      boolean flatColour,
+      boolean doNotDraw,
+      boolean attributeD,
+      boolean wrapU,
+      boolean wrapV,
+      byte attributeE,
+      boolean attributeF,
+      boolean attributeG,
+      int attributeH);
+
+  native void AA(float[] matrix);
+
+  native void wa(float[] matrix);
+
+  native void IA(float ambient);
+
+  native void m(int colour, float front, float back, float x, float y, float z);
+
+  native void c(int colour, int start);
+
+  native void Q(int count, int[] lights, float[] strengths);
+
+  native void M(int height, int colour, int range, int unused);
+
+  native void JA(int height, int colour, int range, int unused);
+
+  native void O();
+
+  native void J(int resolution);
+
+  ja(TextureSource textures, int count) {
     synchronized (ja.class) {
       if (current != null) {
         throw new IllegalStateException("A toolkit is open already");
       }
-      q(null, 0);
+      q(textures, count);
       current = this;
     }
+    this.textures = textures;
+    try {
+      for (int id = 0; id < count; id++) {
+        upload(id, textures.metrics(id));
+      }
+    } catch (RuntimeException | Error e) {
+      close();
+      throw e;
+    }
+  }
+
+  private void upload(int id, TextureMetrics metrics) {
+    V(
+        (short) id,
+        (short) metrics.averageHsl(),
+        metrics.alpha().code(),
+        (byte) metrics.lighting(),
+        (byte) 0,
+        0,
+        false,
+        (byte) metrics.greyBlend(),
+        (byte) metrics.brighten(),
+        (byte) metrics.scrollU(),
+        (byte) metrics.scrollV(),
+        metrics.flatColour(),
+        metrics.hidden(),
+        false,
+        metrics.wrapU(),
+        metrics.wrapV(),
+        (byte) 0,
+        false,
+        false,
+        0);
+  }
+
+  private void upload(int id, int[] pixels, TextureMetrics metrics) {
+    F(
+        (short) id,
+        pixels,
+        (short) metrics.averageHsl(),
+        metrics.alpha().code(),
+        (byte) metrics.lighting(),
+        (byte) 0,
+        0,
+        false,
+        (byte) metrics.greyBlend(),
+        (byte) metrics.brighten(),
+        (byte) metrics.scrollU(),
+        (byte) metrics.scrollV(),
+        metrics.flatColour(),
+        metrics.hidden(),
+        false,
+        metrics.wrapU(),
+        metrics.wrapV(),
+        (byte) 0,
+        false,
+        false,
+        0);
   }
 
   // Called by the library.
 
-  /** A texture is needed. There is no source of textures. */
-  @SuppressWarnings("unused")
-  private boolean SA(short id) {
-    return false;
+  /** A texture is needed, in the middle of drawing: it is uploaded now, or there is none. Nothing may be thrown. */
+  boolean SA(short id) {
+    int number = Short.toUnsignedInt(id);
+    try {
+      int[] pixels = textures == null ? null : textures.pixels(number);
+      if (pixels != null) {
+        upload(number, pixels, textures.metrics(number));
+      }
+      return pixels != null;
+    } catch (Throwable e) {
+      report(e);
+      return false;
+    }
+  }
+
+  private static void report(Throwable e) {
+    Thread thread = Thread.currentThread();
+    thread.getUncaughtExceptionHandler().uncaughtException(thread, e);
   }
 
   /** A pool has no room left. Nothing may be thrown into the allocation that waits. */
@@ -135,8 +280,7 @@ final class ja implements Toolkit {
     try {
       pressureListener.run();
     } catch (Throwable e) {
-      Thread thread = Thread.currentThread();
-      thread.getUncaughtExceptionHandler().uncaughtException(thread, e);
+      report(e);
     } finally {
       collecting = false;
     }
@@ -448,6 +592,79 @@ final class ja implements Toolkit {
   public void setDepthRange(float near, float far) {
     live();
     GA(near, far);
+  }
+
+  // Scene.
+
+  @Override
+  public void setCamera(Matrix camera) {
+    live();
+    AA(camera.toArray());
+  }
+
+  @Override
+  public void setProjection(Matrix projection) {
+    live();
+    wa(projection.toArray());
+  }
+
+  @Override
+  public void setAmbient(float level) {
+    live();
+    IA(level);
+  }
+
+  @Override
+  public void setSun(Sun sun) {
+    live();
+    m(sun.colour(), sun.front(), sun.back(), sun.x(), sun.y(), sun.z());
+  }
+
+  @Override
+  public void setFog(int colour, int fogDepth) {
+    live();
+    c(colour, fogDepth);
+  }
+
+  @Override
+  public void setPointLights(List<PointLight> lights) {
+    live();
+    int[] places = new int[5 * lights.size()];
+    float[] strengths = new float[lights.size()];
+    for (int i = 0; i < strengths.length; i++) {
+      PointLight light = lights.get(i);
+      places[5 * i] = light.x();
+      places[5 * i + 1] = light.y();
+      places[5 * i + 2] = light.z();
+      places[5 * i + 3] = light.range();
+      places[5 * i + 4] = light.colour();
+      strengths[i] = light.strength();
+    }
+    Q(strengths.length, places, strengths);
+  }
+
+  @Override
+  public void enterWater(Water water) {
+    live();
+    M(water.height(), water.colour(), water.range(), 0);
+  }
+
+  @Override
+  public void changeWater(Water water) {
+    live();
+    JA(water.height(), water.colour(), water.range(), 0);
+  }
+
+  @Override
+  public void leaveWater() {
+    live();
+    O();
+  }
+
+  @Override
+  public void setShadowResolution(int perTile) {
+    live();
+    J(perTile);
   }
 
   // Drawing.

@@ -133,6 +133,86 @@ public interface Sprite extends AutoCloseable {
    */
   void draw(int x, int y, ClippingMask mask, int maskX, int maskY);
 
+  /**
+   * Draws the sprite turned, sheared and stretched at will, nearest pixels without a filter. One without area draws
+   * nothing.
+   *
+   * @param x0 where the full image's top left corner goes
+   * @param y0 where the full image's top left corner goes
+   * @param x1 where its top right corner goes
+   * @param y1 where its top right corner goes
+   * @param x2 where its bottom left corner goes
+   * @param y2 where its bottom left corner goes
+   * @param tint a change of colours on the way
+   * @param mode how the result combines with the frame
+   */
+  void drawAcross(float x0, float y0, float x1, float y1, float x2, float y2, Tint tint, BlendMode mode);
+
+  /**
+   * Draws the sprite turned, sheared and stretched at will, inside a shape.
+   *
+   * @param x0 where the full image's top left corner goes
+   * @param y0 where the full image's top left corner goes
+   * @param x1 where its top right corner goes
+   * @param y1 where its top right corner goes
+   * @param x2 where its bottom left corner goes
+   * @param y2 where its bottom left corner goes
+   * @param mask the shape
+   * @param maskX left edge of the shape's box
+   * @param maskY top edge of the shape's box
+   * @param mode {@link BlendMode#REPLACE} or {@link BlendMode#ALPHA}
+   * @throws IllegalArgumentException for {@link BlendMode#ADD}
+   */
+  void drawAcross(
+      float x0,
+      float y0,
+      float x1,
+      float y1,
+      float x2,
+      float y2,
+      ClippingMask mask,
+      int maskX,
+      int maskY,
+      BlendMode mode);
+
+  /**
+   * Draws the sprite turned around its middle.
+   *
+   * @param x column of the middle
+   * @param y row of the middle
+   * @param angle radians, with the clock
+   * @param scale 1 for its own size
+   * @param tint a change of colours on the way
+   * @param mode how the result combines with the frame
+   */
+  default void drawRotated(double x, double y, double angle, double scale, Tint tint, BlendMode mode) {
+    double c = Math.cos(angle) * scale;
+    double s = Math.sin(angle) * scale;
+    double w = fullWidth();
+    double h = fullHeight();
+    double x0 = x - (w * c - h * s) / 2;
+    double y0 = y - (w * s + h * c) / 2;
+    drawAcross(
+        (float) x0,
+        (float) y0,
+        (float) (x0 + w * c),
+        (float) (y0 + w * s),
+        (float) (x0 - h * s),
+        (float) (y0 + h * c),
+        tint,
+        mode);
+  }
+
+  /**
+   * Fills a rectangle with copies of the sprite, side by side from its top left corner.
+   *
+   * @param area the rectangle
+   * @param tint a change of colours on the way
+   * @param mode how the result combines with the frame
+   * @throws IllegalArgumentException if the sprite's full size is 0 by 0 or the like
+   */
+  void drawTiled(Rect area, Tint tint, BlendMode mode);
+
   /** Gives the pixels back. If the sprite is the target, the toolkit draws to nothing from then on. */
   @Override
   void close();

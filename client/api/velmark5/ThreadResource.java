@@ -17,10 +17,9 @@ public interface ThreadResource extends AutoCloseable {
    * Draws a model on the toolkit's target. One thread at a time draws a model, each with its own resource.
    *
    * @param model the model
-   * @param matrix from the model to the world: four rows of four numbers, the last row is where it stands
-   * @throws IllegalArgumentException if there are not 16 numbers
+   * @param matrix from the model to the world
    */
-  void draw(Model model, float[] matrix);
+  void draw(Model model, Matrix matrix);
 
   /**
    * Draws a model and tells where it stands.
@@ -29,7 +28,37 @@ public interface ThreadResource extends AutoCloseable {
    * @param matrix from the model to the world, as for {@link #draw}
    * @return its place, or nothing when it is out of view
    */
-  Optional<ScreenPlacement> drawPlaced(Model model, float[] matrix);
+  Optional<ScreenPlacement> drawPlaced(Model model, Matrix matrix);
+
+  /**
+   * Draws a triangle on the toolkit's target, cut to its clip rectangle, in front of everything. Colours run smoothly from
+   * corner to corner; the corners may come in any order.
+   *
+   * @param x0 column of the first corner
+   * @param y0 row of the first corner
+   * @param colour0 0xAARRGGBB at the first corner
+   * @param x1 column of the second corner
+   * @param y1 row of the second corner
+   * @param colour1 0xAARRGGBB at the second corner
+   * @param x2 column of the third corner
+   * @param y2 row of the third corner
+   * @param colour2 0xAARRGGBB at the third corner
+   */
+  void fillTriangle(
+      float x0, float y0, int colour0, float x1, float y1, int colour1, float x2, float y2, int colour2);
+
+  /**
+   * Draws a line of some thickness on the toolkit's target. Its ends are taken from the clip rectangle's corner.
+   *
+   * @param x0 column of one end
+   * @param y0 row of one end
+   * @param x1 column of the other end
+   * @param y1 row of the other end
+   * @param colour 0xAARRGGBB
+   * @param thickness pixels
+   * @param mode how it combines with the frame; {@link BlendMode#ADD} draws as {@link BlendMode#REPLACE}
+   */
+  void line(int x0, int y0, int x1, int y1, int colour, int thickness, BlendMode mode);
 
   /** Gives the memory back. No thread may be drawing with it. */
   @Override

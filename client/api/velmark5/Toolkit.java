@@ -10,7 +10,7 @@ import velmark5.spi.Peers;
  *
  * <p>Its calls belong to the control thread. Closing it closes everything that it made.
  */
-public interface Toolkit extends Painter, AutoCloseable {
+public interface Toolkit extends Painter, Scene, AutoCloseable {
   /**
    * Loads the native library and starts the renderer. The calling thread is set to treat numbers too small for a normal
    * float as 0, and so are threads that it starts later.
@@ -20,7 +20,26 @@ public interface Toolkit extends Painter, AutoCloseable {
    * @throws UnsatisfiedLinkError if there is no library for this machine
    */
   static Toolkit create() {
-    return Peers.instance().createToolkit();
+    return Peers.instance().createToolkit(null, 0);
+  }
+
+  /**
+   * Loads the native library and starts the renderer with textures. The source is asked for the metrics of all textures
+   * before this returns.
+   *
+   * @param textures where textures come from
+   * @param count how many there are, with ids from 0; at most 65535
+   * @return the toolkit
+   * @throws IllegalArgumentException if the count is out of range
+   * @throws IllegalStateException if a toolkit is open already
+   * @throws UnsatisfiedLinkError if there is no library for this machine
+   */
+  static Toolkit create(TextureSource textures, int count) {
+    Objects.requireNonNull(textures, "textures");
+    if (count < 0 || count > 65535) {
+      throw new IllegalArgumentException("count: " + count + " is not 0 to 65535");
+    }
+    return Peers.instance().createToolkit(textures, count);
   }
 
   /**

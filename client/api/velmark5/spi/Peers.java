@@ -1,5 +1,6 @@
 package velmark5.spi;
 
+import velmark5.TextureSource;
 import velmark5.Toolkit;
 
 /**
@@ -10,10 +11,12 @@ public interface Peers {
   /**
    * Loads the native library if that has not happened yet and makes the process's toolkit.
    *
+   * @param textures where textures come from, or null for none
+   * @param count how many there are
    * @return the new toolkit
    * @throws IllegalStateException if a toolkit is open already
    */
-  Toolkit createToolkit();
+  Toolkit createToolkit(TextureSource textures, int count);
 
   /**
    * The implementation.

@@ -158,7 +158,16 @@ public final class Demo {
       Radar radar = new Radar(toolkit, pool);
       hud = new Hud(toolkit, pool, spectrum, radar);
       scenes =
-          List.of(new Sky(toolkit), new Hills(toolkit), new Lanterns(toolkit), new Lake(toolkit), spectrum, radar, hud);
+          List.of(
+              new Sky(toolkit),
+              new Hills(toolkit),
+              new Knot(toolkit),
+              new Lanterns(toolkit),
+              new Lake(toolkit),
+              spectrum,
+              radar,
+              new Compass(toolkit),
+              hud);
     }
 
     /** Adapts the frame to what it is shown in, and returns its size. */

@@ -2,14 +2,18 @@ package velmark5.demo;
 
 import velmark5.BlendMode;
 import velmark5.Colour;
+import velmark5.Rect;
+import velmark5.Sprite;
+import velmark5.Tint;
 import velmark5.Toolkit;
 
-/** Paper lanterns that rise from the far shore: rings of additive light around a warm core. */
+/** Paper lanterns that rise from the far shore: a halo, drawn once into a sprite and added at every size, around a warm core. */
 final class Lanterns implements Scene {
   private static final int COUNT = 30;
-  private static final int RINGS = 22;
+  private static final int RINGS = 26;
 
   private final Toolkit toolkit;
+  private Sprite halo;
   private int width;
   private int height;
 
@@ -21,6 +25,17 @@ final class Lanterns implements Scene {
   public void resize(int newWidth, int newHeight) {
     width = newWidth;
     height = newHeight;
+    if (halo != null) {
+      halo.close();
+    }
+    int reach = Math.max(2, height / 20);
+    halo = toolkit.createSprite(2 * reach + 1, 2 * reach + 1);
+    toolkit.drawTo(halo, null);
+    toolkit.clear(Colour.TRANSPARENT);
+    for (int i = RINGS; i > 0; i--) {
+      double far = i / (double) RINGS;
+      toolkit.fillCircle(reach, reach, (int) Math.round(reach * far * far), 0x00050301, BlendMode.ADD);
+    }
   }
 
   @Override
@@ -37,11 +52,12 @@ final class Lanterns implements Scene {
   }
 
   private void glow(int x, int y, double radius, double light) {
-    for (int i = RINGS; i > 0; i--) {
-      double far = i / (double) RINGS;
-      toolkit.fillCircle(
-          x, y, (int) Math.round(radius * far * far * 2.2), Colour.scale(0xFFFF8A2E, 0.021 * light), BlendMode.ADD);
-    }
+    int reach = Math.max(2, (int) (radius * 2.2));
+    int level = (int) (255 * light);
+    halo.drawScaled(
+        new Rect(x - reach, y - reach, 2 * reach + 1, 2 * reach + 1),
+        Tint.multiply(Colour.rgb(level, level, level)),
+        BlendMode.ADD);
     int core = Math.max(1, (int) (radius / 6));
     toolkit.fillRect(x - core, y - core - core / 2, 2 * core, 3 * core, Colour.scale(0xFFFFC070, light), BlendMode.ADD);
     toolkit.fillRect(x - core, y + core, 2 * core, core / 2 + 1, Colour.scale(0xFFFFE6B0, light), BlendMode.ADD);

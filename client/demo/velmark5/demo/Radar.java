@@ -6,6 +6,7 @@ import velmark5.Colour;
 import velmark5.Font;
 import velmark5.MemoryPool;
 import velmark5.Spans;
+import velmark5.ThreadResource;
 import velmark5.Toolkit;
 
 /** A round instrument: a beam that sweeps over a disc, cut to the disc's shape by a mask. */
@@ -18,6 +19,7 @@ final class Radar implements Scene {
 
   private final Toolkit toolkit;
   private final MemoryPool pool;
+  private final ThreadResource resource;
   private ClippingMask disc;
   private int centreX;
   private int centreY;
@@ -26,6 +28,7 @@ final class Radar implements Scene {
   Radar(Toolkit toolkit, MemoryPool pool) {
     this.toolkit = toolkit;
     this.pool = pool;
+    resource = toolkit.createThreadResource();
   }
 
   @Override
@@ -50,7 +53,14 @@ final class Radar implements Scene {
       double fade = Math.pow(1 - i / (double) (TAIL + 1), 2.2);
       ray(beam - i * 0.0048, Colour.mix(GLASS, 0xFF1FA870, fade * 0.8), BlendMode.REPLACE);
     }
-    ray(beam, Colour.scale(PHOSPHOR, 0.7), BlendMode.ADD);
+    resource.line(
+        centreX,
+        centreY,
+        centreX + (int) Math.round((radius - 3) * Math.cos(beam)),
+        centreY + (int) Math.round((radius - 3) * Math.sin(beam)),
+        Colour.withAlpha(PHOSPHOR, 150),
+        3,
+        BlendMode.ALPHA);
     paintScale();
     paintEchoes(beam);
     paintShine();

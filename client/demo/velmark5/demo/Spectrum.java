@@ -4,6 +4,7 @@ import velmark5.BlendMode;
 import velmark5.Colour;
 import velmark5.Rect;
 import velmark5.Sprite;
+import velmark5.Tint;
 import velmark5.Toolkit;
 
 /** A translucent panel: a curve over a grid, and below it the curve's past, which scrolls down one row per frame. */
@@ -13,7 +14,10 @@ final class Spectrum implements Scene {
     0xFF04060F, 0xFF0D1540, 0xFF252B86, 0xFF5B2E9E, 0xFFA8358F, 0xFFE3506A, 0xFFF98E4A, 0xFFFDCB5C, 0xFFFFF7D0
   };
 
+  private static final int HATCH = 6;
+
   private final Toolkit toolkit;
+  private final Sprite hatch;
   private Sprite waterfall;
   private double[] levels = {};
   private Rect panel = new Rect(0, 0, 0, 0);
@@ -22,6 +26,12 @@ final class Spectrum implements Scene {
 
   Spectrum(Toolkit toolkit) {
     this.toolkit = toolkit;
+    // A fine diagonal pattern that the panel is tiled with.
+    int[] pattern = new int[HATCH * HATCH];
+    for (int i = 0; i < HATCH; i++) {
+      pattern[i * HATCH + HATCH - 1 - i] = 0x14CFE4FF;
+    }
+    hatch = toolkit.createSprite(pattern, HATCH, HATCH, HATCH, false);
   }
 
   Rect panel() {
@@ -102,6 +112,7 @@ final class Spectrum implements Scene {
   @Override
   public void paint(double seconds) {
     toolkit.fillRect(panel, 0xA8060C18, BlendMode.ALPHA);
+    toolkit.withClip(panel, () -> hatch.drawTiled(panel, Tint.NONE, BlendMode.ALPHA));
     toolkit.drawRect(panel, 0x00283A50, BlendMode.ADD);
     toolkit.withClip(plot, this::paintPlot);
     if (!past.isEmpty()) {

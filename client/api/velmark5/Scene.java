@@ -1,0 +1,73 @@
+package velmark5;
+
+import java.util.List;
+
+/** What three-dimensional drawing of a frame reads: camera, lights, fog. Set on the control thread, between passes. */
+public interface Scene {
+  /**
+   * Sets the camera.
+   *
+   * @param camera from the world to the view, for instance {@link Matrix#lookAt}
+   */
+  void setCamera(Matrix camera);
+
+  /**
+   * Sets the projection. Set it after the viewport, for the depth at which fog begins follows from both.
+   *
+   * @param projection from the view to the screen's space, for instance {@link Matrix#perspective}
+   */
+  void setProjection(Matrix projection);
+
+  /**
+   * Sets the light that is everywhere.
+   *
+   * @param level about 1
+   */
+  void setAmbient(float level);
+
+  /**
+   * Sets the sun.
+   *
+   * @param sun its light and direction
+   */
+  void setSun(Sun sun);
+
+  /**
+   * Sets the fog of the distance.
+   *
+   * @param colour what far things fade to, 0xRRGGBB
+   * @param depth how far before the far plane fog begins; negative counts as 0
+   */
+  void setFog(int colour, int depth);
+
+  /**
+   * Sets the lamps that models are lit by.
+   *
+   * @param lights the lamps; only the first four count
+   */
+  void setPointLights(List<PointLight> lights);
+
+  /**
+   * Goes under water: the fog takes its colour until {@link #leaveWater()}.
+   *
+   * @param water the water
+   */
+  void enterWater(Water water);
+
+  /**
+   * Changes the water while under it.
+   *
+   * @param water the water
+   */
+  void changeWater(Water water);
+
+  /** Comes out of the water: the fog has its old colour again. */
+  void leaveWater();
+
+  /**
+   * Sets how finely shadows are drawn on the ground.
+   *
+   * @param perTile points per side of a tile, rounded down to a power of two
+   */
+  void setShadowResolution(int perTile);
+}
