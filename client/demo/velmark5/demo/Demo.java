@@ -90,7 +90,7 @@ public final class Demo {
         });
     window.pack();
     window.setVisible(true);
-    try (Toolkit toolkit = Toolkit.create()) {
+    try (Toolkit toolkit = Toolkit.create(new Textures(), Textures.COUNT)) {
       // The window's place on the screen may be smaller than what was asked for.
       Canvas canvas = toolkit.createCanvas(component, Math.max(1, component.getWidth()), Math.max(1, component.getHeight()));
       new Show(toolkit) {
@@ -121,7 +121,7 @@ public final class Demo {
 
   private void runInImage() throws IOException {
     System.out.println("No display: drawing into an image.");
-    try (Toolkit toolkit = Toolkit.create()) {
+    try (Toolkit toolkit = Toolkit.create(new Textures(), Textures.COUNT)) {
       Sprite image = toolkit.createSprite(options.width(), options.height());
       DepthBuffer depth = toolkit.createDepthBuffer(options.width(), options.height());
       new Show(toolkit) {
@@ -153,15 +153,18 @@ public final class Demo {
 
     Show(Toolkit toolkit) {
       this.toolkit = toolkit;
-      MemoryPool pool = toolkit.createPool(1 << 17);
+      MemoryPool pool = toolkit.createPool(1 << 20);
       Spectrum spectrum = new Spectrum(toolkit);
+      Knot knot = new Knot(toolkit);
       Radar radar = new Radar(toolkit, pool);
       hud = new Hud(toolkit, pool, spectrum, radar);
       scenes =
           List.of(
               new Sky(toolkit),
               new Hills(toolkit),
-              new Knot(toolkit),
+              new Stones(toolkit, pool, knot, false),
+              knot,
+              new Stones(toolkit, pool, knot, true),
               new Lanterns(toolkit),
               new Lake(toolkit),
               spectrum,

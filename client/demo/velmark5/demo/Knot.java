@@ -68,6 +68,11 @@ final class Knot implements Scene {
     return new double[] {v[0] / length, v[1] / length, v[2] / length};
   }
 
+  /** The part of the frame that the knot turns in. */
+  Rect viewport() {
+    return viewport;
+  }
+
   @Override
   public void resize(int width, int height) {
     int side = Math.max(1, Math.min(width, height * 16 / 9) * 44 / 100);
