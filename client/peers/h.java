@@ -182,8 +182,8 @@ final class h extends Peer implements Model {
     }
 
     int indexOf(Material material) {
-      int index = material.texture() == Material.NO_TEXTURE ? -1 : table.indexOf(material.mapping());
-      return index < 0 ? DEFAULT_MAPPING : index;
+      boolean mapped = material.texture() != Material.NO_TEXTURE && material.mapping() != null;
+      return mapped ? table.indexOf(material.mapping()) : DEFAULT_MAPPING;
     }
 
     private void put(int i, TextureMapping mapping) {

@@ -21,7 +21,7 @@ public interface TextureSource {
    *
    * @param id which texture, from 0
    * @return {@link #SIZE} times {@link #SIZE} words 0xAARRGGBB, row after row, or null when it cannot be had now: then
-   *     what needs it is not drawn, and it is asked for again the next time
+   *     faces are drawn without it, and it is asked for again the next time
    */
   int[] pixels(int id);
 }
