@@ -100,7 +100,7 @@ void RenderTriangle(const Triangle_s& triangle) {
 
   HalfTriangle_s half;
   half.y = start;
-  half.rows = end - start;
+  half.rows = wrapping_subtract(end, start);
   if constexpr (Shade == ShadeMode_e::Flat) half.flatcolour = triangle.flatcolour;
   if constexpr (Blend == BlendMode_e::ConstantAlpha) half.alpha = triangle.alpha;
   if constexpr (textured) half.texture[0] = triangle.texture[0];
