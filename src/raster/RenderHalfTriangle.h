@@ -47,25 +47,27 @@ alignas(16) inline constexpr std::int16_t PairInGroup[4][8] = {{0, 0, 0, 0, 1, 1
 
 // A depth or a coordinate, a lane for each pixel of the group.
 struct RunningFloat {
-  SSEMath::Float4 value, step;  // the step is of a whole group
+  SSEMath::Float4 value, step;  // the step is per pixel until many(), then per group
 
   VELMARK5_LANE void start(SSEMath::Float4 first, SSEMath::Float4 per_pixel) {
     value = first + per_pixel * SSEMath::load(ZeroOneTwoThree);
-    step = per_pixel * SSEMath::splat(4.0f);
+    step = per_pixel;
   }
+  VELMARK5_LANE void many() { step = step * SSEMath::splat(4.0f); }
   VELMARK5_LANE void advance() { value += step; }
 };
 
 // Four channels, for the first two pixels of the group; the other two are one step on.
 struct RunningWords {
-  SSEMath::Word8 value, step;  // the step is of two pixels
+  SSEMath::Word8 value, step, group_step;  // the steps are of two pixels, and of four, after many()
 
   // first: the value at the start of the span, per_pixel: the step, both in both halves.
   VELMARK5_LANE void start(SSEMath::Word8 first, SSEMath::Word8 per_pixel, unsigned int before) {
     value = first + per_pixel * SSEMath::load(PairInGroup[before]);
     step = per_pixel + per_pixel;
   }
-  VELMARK5_LANE void advance() { value = value + (step + step); }
+  VELMARK5_LANE void many() { group_step = step + step; }
+  VELMARK5_LANE void advance() { value = value + group_step; }
   VELMARK5_LANE SSEMath::Channels pixels() const { return {value, value + step}; }
 };
 
@@ -80,18 +82,19 @@ struct HorizontalLine_s {
   RunningFloat z, u, v;       // depth, u/z, v/z
   RunningWords colour, fog, weight0, weight1;
 
+  // Does the same to all values that run.
   template <SpanModes Modes>
-  VELMARK5_LANE void advance() {
-    if constexpr (Modes.runs_depth()) z.advance();
+  VELMARK5_LANE void each(auto&& action) {
+    if constexpr (Modes.runs_depth()) action(z);
     if constexpr (Modes.textured()) {
-      u.advance();
-      v.advance();
+      action(u);
+      action(v);
     }
-    if constexpr (Modes.runs_colour()) colour.advance();
-    if constexpr (Modes.adds_fog()) fog.advance();
+    if constexpr (Modes.runs_colour()) action(colour);
+    if constexpr (Modes.adds_fog()) action(fog);
     if constexpr (Modes.blended()) {
-      weight0.advance();
-      weight1.advance();
+      action(weight0);
+      action(weight1);
     }
   }
 };
@@ -177,24 +180,23 @@ VELMARK5_LANE void fill_group(const HorizontalLine_s& line, const HalfTriangle_s
 template <SpanModes Modes>
 VELMARK5_LANE void RenderHLine(HorizontalLine_s& line, const HalfTriangle_s& half) {
   using namespace SSEMath;
-  const auto width = static_cast<std::size_t>(line.end - line.start);
+  const auto advance = [&] { line.template each<Modes>([](auto& running) { running.advance(); }); };
   std::ptrdiff_t x = line.start - static_cast<std::ptrdiff_t>(line.before);
-  const std::ptrdiff_t last = x + static_cast<std::ptrdiff_t>((line.before + width - 1) & ~std::size_t{3});
-  const std::size_t tail = (line.before + width) & 3;
-  const std::size_t cut = 4 - std::min<std::size_t>(line.before + width, 4);
+  const auto pixels = static_cast<std::size_t>(line.end - x);  // from the first group's start
+  const std::ptrdiff_t last = x + static_cast<std::ptrdiff_t>((pixels - 1) & ~std::size_t{3});
 
-  // The first and the last group share one masked body, the groups between have their own without a mask.
-  Int4 mask = load(UnalignedMasks[1][line.before]) & load(RightClippingMasks[cut]);
-  for (;;) {
-    fill_group<Modes, true>(line, half, x, mask);
-    if (x == last) break;
-    line.template advance<Modes>();
-    for (x += 4; x != last; x += 4) {
-      fill_group<Modes, false>(line, half, x, splat(F));
-      line.template advance<Modes>();
-    }
-    mask = load(UnalignedMasks[0][tail]);
+  // The first group, which may be the last one too: most spans of small triangles end here.
+  const std::size_t cut = 4 - std::min<std::size_t>(pixels, 4);
+  fill_group<Modes, true>(line, half, x, load(UnalignedMasks[1][line.before]) & load(RightClippingMasks[cut]));
+  if (x == last) return;
+
+  line.template each<Modes>([](auto& running) { running.many(); });
+  advance();
+  for (x += 4; x != last; x += 4) {
+    fill_group<Modes, false>(line, half, x, splat(F));
+    advance();
   }
+  fill_group<Modes, true>(line, half, x, load(UnalignedMasks[0][pixels & 3]));
 }
 
 // --- The rows of a trapezoid ----------------------------------------------------------------------------------------
