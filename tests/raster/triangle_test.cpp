@@ -331,8 +331,7 @@ class TriangleTest : public testing::Test {
     RecomputeDistanceFogParams(0, 0);
   }
 
-  // A quad's half that covers rows 0 to 7 of columns x0 to x1 - 1: its right edge leans outward below the clipped
-  // rows.
+  // Columns x0 to x1 - 1 from row 0 down; the right edge moves in by a pixel in thousands of rows.
   static Triangle_s wedge(float x0, float x1, float z = 0.25f) {
     Triangle_s t{};
     t.vertex[0] = {x0, 0, z, 1};
@@ -596,17 +595,20 @@ TEST_F(TriangleTest, CoordinateMinusOneWrapsOrClamps) {
   EXPECT_EQ(colour.at(5, 2), 0x7F7F7F7Fu);
 }
 
+// Less than one unit per pixel is nothing; what is beyond whole units is lost too.
 TEST_F(TriangleTest, SlowColourStepsAreLost) {
   Triangle_s t = wedge(0, 64);
-  set_colour(t, 0);
-  for (std::uint16_t& c : t.colour[1].channels) c = 63;  // less than one unit per pixel
-  for (std::uint16_t& c : t.colour[1].channels) c = static_cast<std::uint16_t>(c + 0x10);
-  instance(smooth)(t);
-  // 79 over 64 pixels is one unit per pixel: 63 at the last, where an exact ramp would reach 77.
-  EXPECT_EQ(colour.at(63, 0), 0u);
-  for (std::uint16_t& c : t.colour[1].channels) c = 128 * 64 + 63;
-  instance(smooth)(t);
-  EXPECT_EQ(colour.at(63, 0) & 0xFF, 128u * 63 >> 8);
+  const auto blue_at_the_end = [&](int right) {
+    for (std::uint16_t& c : t.colour[1].channels) c = static_cast<std::uint16_t>(right);
+    instance(smooth)(t);
+    return colour.at(63, 0) & 0xFF;
+  };
+  set_colour(t, 0xFFFF);
+  t.colour[0] = t.colour[2] = {};
+  EXPECT_EQ(blue_at_the_end(63), 0u);
+  EXPECT_EQ(blue_at_the_end(128 * 64 + 63), 128u * 63 >> 8);
+  set_colour(t, 0x80FF);
+  EXPECT_EQ(blue_at_the_end(0x80FF + 63), 0x80u) << "an exact ramp would reach 0x81";
 }
 
 // Zero times infinity is not a number, which counts as no fog.
