@@ -6,7 +6,7 @@ package velmark5;
  * @param colour 0xRRGGBB
  * @param front strength on faces that turn to the sun
  * @param back strength on faces that turn away
- * @param x direction; its length does not count
+ * @param x direction towards the sun; its length does not count
  * @param y direction, down; not 0
  * @param z direction
  */

@@ -187,12 +187,13 @@ public final class Demo {
       Meter shown = new Meter(0.5);
       while (true) {
         long began = System.nanoTime();
+        // Decided before the frame is drawn, so that the last one fits the window as it was left.
+        boolean last = !running || drawn + 1 == options.frames();
         // A counted run is the same in every run; else the clock leads.
         double seconds = options.frames() > 0 ? drawn / FRAMES_PER_SECOND : (began - start) / 1e9;
         draw(seconds);
         drawn++;
         // A present may exchange images, so the last frame is taken before it.
-        boolean last = !running || drawn == options.frames();
         BufferedImage picture = last && options.png() != null ? toolkit.snapshot() : null;
         present();
         long done = System.nanoTime();
