@@ -111,6 +111,8 @@ VELMARK5_LANE Int4 broadcast_mask(Int4 a) {
 }
 // Set in lanes 0 and 1, clear in lanes 2 and 3.
 VELMARK5_LANE Int4 low_half_mask() { return {_mm_setr_epi32(-1, -1, 0, 0)}; }
+// All bits of the lanes whose top bit is set.
+VELMARK5_LANE Int4 sign_mask(Int4 a) { return {_mm_srai_epi32(a.v, 31)}; }
 // One bit for each lane's sign.
 VELMARK5_LANE int lane_bits(Int4 mask) { return _mm_movemask_ps(_mm_castsi128_ps(mask.v)); }
 VELMARK5_LANE Int4 truncate(Float4 a) { return {_mm_cvttps_epi32(a.v)}; }

@@ -122,13 +122,17 @@ void parallelogram(const Sprite_c& sprite, const ParallelogramRenderParams& para
     if (run.to <= run.from) continue;
     cut_run(run, v, scan.dv_x, v_end);
     if (run.to <= run.from) continue;
+    if (row + 2 < scan.rows) {
+      sprite_pixels::fetch_ahead(to + 2 * std::ptrdiff_t{target.pitch} + run.from, static_cast<int>(run.to - run.from));
+    }
     const sprite_pixels::Line line = {sprite.pixels,
                                       static_cast<std::uint32_t>(sprite.width),
                                       static_cast<std::uint32_t>(u + run.from * scan.du_x),
                                       static_cast<std::uint32_t>(v + run.from * scan.dv_x),
                                       static_cast<std::uint32_t>(scan.du_x),
                                       static_cast<std::uint32_t>(scan.dv_x)};
-    sprite_pixels::draw_run<Op, Blend>(to + run.from, static_cast<int>(run.to - run.from), operation, line);
+    sprite_pixels::draw_run<Blend>(to + run.from, static_cast<int>(run.to - run.from),
+                                   sprite_pixels::Operated{operation, line});
   }
 }
 

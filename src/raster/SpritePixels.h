@@ -7,6 +7,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <type_traits>
 
 #include "maths/SSEMath.h"
 #include "raster/Sprite.h"
@@ -137,7 +138,29 @@ struct Blending<BlendMode_e::alpha> {
     const Word8 a = alphas(s);
     return packed(mulhi(planes_shifted(s), a) + mulhi(planes_shifted(d), splat_word(256) - a));
   }
+
+  // What of it the image alone decides: the first product, and 256 - a in both words of each pixel.
+  struct Terms {
+    Int4 product, rest;
+  };
+  template <class Source>
+  VELMARK5_LANE static Terms terms(Source s) {
+    const Word8 a = alphas(s);
+    return {packed(mulhi(planes_shifted(s), a)), pixels(splat_word(256) - a)};
+  }
+  VELMARK5_LANE Int4 operator()(Terms s, Int4 d) const {
+    return add_bytes(s.product, packed(mulhi(planes_shifted(d), words(s.rest))));
+  }
 };
+
+// Where every alpha is 0 or 255 that blend is d or max(s - 1, 0).
+VELMARK5_LANE bool only_clear_or_full(Int4 s, Int4 t) {
+  const Int4 one = splat(0x01000000u);
+  return lane_bits(equal(((s + one) | (t + one)) & splat(0xFE000000u), splat(0u))) == 15;
+}
+VELMARK5_LANE Int4 blend_clear_or_full(Int4 s, Int4 d) {
+  return select(sign_mask(s), subtract_saturating_bytes(s, splat(0x01010101u)), d);
+}
 
 // min(d + s, 255)
 template <>
@@ -149,42 +172,9 @@ struct Blending<BlendMode_e::additive> {
   }
 };
 
-// --- Runs -----------------------------------------------------------------------------------------------------------
-
-// Draws n pixels to `to`. source(i) gives the four pixels from i on, source.one(i) pixel i in lane 0; they are asked
-// for in order and once each.
-template <ColourOp_e Op, BlendMode_e Blend, class Source>
-VELMARK5_LANE void draw_run(std::uint32_t* to, int n, const Operation<Op>& operation, Source source) {
-  constexpr Blending<Blend> blend;
-  int i = 0;
-  for (; i + 4 <= n; i += 4) {
-    const Int4 d = blend.reads_target ? load_unaligned(to + i) : Int4{};
-    store_unaligned(to + i, blend(operation(source(i)), d));
-  }
-  for (; i < n; ++i) {
-    const Int4 d = blend.reads_target ? load_one(to + i) : Int4{};
-    store_one(to + i, blend(operation(source.one(i)), d));
-  }
-}
-
-// The same where z <= depth.
-template <ColourOp_e Op, BlendMode_e Blend, class Source>
-VELMARK5_LANE void draw_run_tested(std::uint32_t* to, const float* depth, Float4 z, int n,
-                                   const Operation<Op>& operation, Source source) {
-  constexpr Blending<Blend> blend;
-  int i = 0;
-  for (; i + 4 <= n; i += 4) {
-    const Int4 passes = less_equal(z, load_unaligned(depth + i));
-    if (lane_bits(passes) == 0) continue;
-    const Int4 d = load_unaligned(to + i);
-    store_unaligned(to + i, select(passes, blend(operation(source(i)), d), d));
-  }
-  for (; i < n; ++i) {
-    const Int4 passes = less_equal(z, load_one(depth + i));
-    const Int4 d = load_one(to + i);
-    store_one(to + i, select(passes, blend(operation(source.one(i)), d), d));
-  }
-}
+// --- Where pixels come from -----------------------------------------------------------------------------------------
+//
+// source(i) gives the four pixels from i on, source.one(i) pixel i in lane 0. Runs ask in order, once for each pixel.
 
 // Pixels one after the other.
 struct Row {
@@ -193,17 +183,15 @@ struct Row {
   VELMARK5_LANE Int4 one(int i) const { return load_one(from + i); }
 };
 
-VELMARK5_LANE Int4 gathered(std::uint32_t a, std::uint32_t b, std::uint32_t c, std::uint32_t d) {
-  return {_mm_setr_epi32(static_cast<int>(a), static_cast<int>(b), static_cast<int>(c), static_cast<int>(d))};
+VELMARK5_LANE Int4 gathered(Int4 a, Int4 b, Int4 c, Int4 d) {
+  return {_mm_unpacklo_epi64(_mm_unpacklo_epi32(a.v, b.v), _mm_unpacklo_epi32(c.v, d.v))};
 }
 
 // The pixels at column[i].
 struct Columns {
   const std::uint32_t* from;
-  const int* column;
-  VELMARK5_LANE Int4 operator()(int i) const {
-    return gathered(from[column[i]], from[column[i + 1]], from[column[i + 2]], from[column[i + 3]]);
-  }
+  const std::uint32_t* column;
+  VELMARK5_LANE Int4 operator()(int i) const { return gathered(one(i), one(i + 1), one(i + 2), one(i + 3)); }
   VELMARK5_LANE Int4 one(int i) const { return load_one(from + column[i]); }
 };
 
@@ -214,20 +202,134 @@ struct Line {
   std::uint32_t width;
   std::uint32_t u, v, du, dv;
 
-  VELMARK5_LANE Int4 operator()(int) {
-    const std::uint32_t a = next();
-    const std::uint32_t b = next();
-    const std::uint32_t c = next();
-    return gathered(a, b, c, next());
+  VELMARK5_LANE Int4 operator()(int i) {
+    const Int4 a = one(i);
+    const Int4 b = one(i);
+    const Int4 c = one(i);
+    return gathered(a, b, c, one(i));
   }
-  VELMARK5_LANE Int4 one(int) { return splat(next()); }
-
-  VELMARK5_LANE std::uint32_t next() {
-    const std::uint32_t pixel = from[(v >> 12) * width + (u >> 12)];
+  VELMARK5_LANE Int4 one(int) {
+    const Int4 pixel = load_one(from + ((v >> 12) * width + (u >> 12)));
     u += du;
     v += dv;
     return pixel;
   }
 };
+
+// A source behind a colour operation.
+template <ColourOp_e Op, class Source>
+struct Operated {
+  Operation<Op> operation;
+  Source source;
+  VELMARK5_LANE auto operator()(int i) { return operation(source(i)); }
+  VELMARK5_LANE auto one(int i) { return operation(source.one(i)); }
+};
+template <ColourOp_e Op, class Source>
+Operated(Operation<Op>, Source) -> Operated<Op, Source>;
+
+// A row that is drawn several times, worked out as far as the target does not matter.
+template <BlendMode_e>
+struct Prepared {
+  static constexpr int capacity = 512;
+  alignas(16) std::uint32_t words[capacity];
+
+  template <class Source>
+  void put(int n, Source source) {
+    int i = 0;
+    for (; i + 4 <= n; i += 4) store(words + i, packed(source(i)));
+    for (; i < n; ++i) store_one(words + i, packed(source.one(i)));
+  }
+  VELMARK5_LANE Int4 operator()(int i) const { return load(words + i); }
+  VELMARK5_LANE Int4 one(int i) const { return load_one(words + i); }
+};
+
+template <>
+struct Prepared<BlendMode_e::alpha> {
+  using Blend = Blending<BlendMode_e::alpha>;
+  static constexpr int capacity = 512;
+  alignas(16) std::uint32_t products[capacity];
+  alignas(16) std::uint32_t rests[capacity];
+
+  template <class Source>
+  void put(int n, Source source) {
+    int i = 0;
+    for (; i + 4 <= n; i += 4) {
+      const Blend::Terms terms = Blend::terms(source(i));
+      store(products + i, terms.product);
+      store(rests + i, terms.rest);
+    }
+    for (; i < n; ++i) {
+      const Blend::Terms terms = Blend::terms(source.one(i));
+      store_one(products + i, terms.product);
+      store_one(rests + i, terms.rest);
+    }
+  }
+  VELMARK5_LANE Blend::Terms operator()(int i) const { return {load(products + i), load(rests + i)}; }
+  VELMARK5_LANE Blend::Terms one(int i) const { return {load_one(products + i), load_one(rests + i)}; }
+};
+
+// --- Runs -----------------------------------------------------------------------------------------------------------
+
+// Has the first pixels of a later row brought to the cache. Rows of a target are pages apart, where the processor does
+// not look ahead by itself.
+VELMARK5_LANE void fetch_ahead(const std::uint32_t* row, int n) {
+  constexpr int line = 16;
+  for (int i = 0; i < n && i < 16 * line; i += line) _mm_prefetch(reinterpret_cast<const char*>(row + i), _MM_HINT_T0);
+}
+
+// Draws n pixels to `to`.
+template <BlendMode_e Blend, class Source>
+VELMARK5_LANE void draw_run(std::uint32_t* to, int n, Source&& source) {
+  constexpr Blending<Blend> blend;
+  int i = 0;
+  for (; i + 4 <= n; i += 4) {
+    const Int4 d = blend.reads_target ? load_unaligned(to + i) : Int4{};
+    store_unaligned(to + i, blend(source(i), d));
+  }
+  for (; i < n; ++i) {
+    const Int4 d = blend.reads_target ? load_one(to + i) : Int4{};
+    store_one(to + i, blend(source.one(i), d));
+  }
+}
+
+// The same for images that are drawn as they stand: icons have many pixels that are either clear or full.
+template <BlendMode_e Blend, class Source>
+VELMARK5_LANE void draw_image_run(std::uint32_t* to, int n, Source&& source) {
+  if constexpr (Blend == BlendMode_e::alpha && std::is_same_v<decltype(source(0)), Int4>) {
+    constexpr Blending<Blend> blend;
+    int i = 0;
+    for (; i + 8 <= n; i += 8) {
+      const Int4 s = source(i);
+      const Int4 t = source(i + 4);
+      const Int4 d = load_unaligned(to + i);
+      const Int4 e = load_unaligned(to + i + 4);
+      const bool simple = only_clear_or_full(s, t);
+      store_unaligned(to + i, simple ? blend_clear_or_full(s, d) : blend(s, d));
+      store_unaligned(to + i + 4, simple ? blend_clear_or_full(t, e) : blend(t, e));
+    }
+    for (; i + 4 <= n; i += 4) store_unaligned(to + i, blend(source(i), load_unaligned(to + i)));
+    for (; i < n; ++i) store_one(to + i, blend(source.one(i), load_one(to + i)));
+  } else {
+    draw_run<Blend>(to, n, source);
+  }
+}
+
+// Draws where z <= depth.
+template <BlendMode_e Blend, class Source>
+VELMARK5_LANE void draw_run_tested(std::uint32_t* to, const float* depth, Float4 z, int n, Source&& source) {
+  constexpr Blending<Blend> blend;
+  int i = 0;
+  for (; i + 4 <= n; i += 4) {
+    const Int4 passes = less_equal(z, load_unaligned(depth + i));
+    if (lane_bits(passes) == 0) continue;
+    const Int4 d = load_unaligned(to + i);
+    store_unaligned(to + i, select(passes, blend(source(i), d), d));
+  }
+  for (; i < n; ++i) {
+    const Int4 passes = less_equal(z, load_one(depth + i));
+    const Int4 d = load_one(to + i);
+    store_one(to + i, select(passes, blend(source.one(i), d), d));
+  }
+}
 
 }  // namespace sprite_pixels

@@ -21,7 +21,8 @@ void plain(const Sprite_c& sprite, const RenderParams_s& params, const SpriteTar
   const unsigned int* from = sprite.pixels + part.skipped_y * sprite.pitch + part.skipped_x;
   unsigned int* to = target.colour + pixel_index(part.x, part.y, target.pitch);
   for (int rows = part.height; rows > 0; --rows, from += sprite.pitch, to += target.pitch) {
-    sprite_pixels::draw_run<Op, Blend>(to, part.width, operation, sprite_pixels::Row{from});
+    if (rows > 2) sprite_pixels::fetch_ahead(to + 2 * std::ptrdiff_t{target.pitch}, part.width);
+    sprite_pixels::draw_image_run<Blend>(to, part.width, sprite_pixels::Operated{operation, sprite_pixels::Row{from}});
   }
 }
 
@@ -43,8 +44,8 @@ void masked(const Sprite_c& sprite, const RenderParams_s& params, const SpriteTa
     const Span span = span_of_row(mask, params.maskx, params.masky, part.y + j, {part.x, i64{part.x} + part.width});
     if (span.to <= span.from) continue;
     const i64 skip = span.from - part.x;
-    sprite_pixels::draw_run<Op, Blend>(to + skip, static_cast<int>(span.to - span.from), operation,
-                                       sprite_pixels::Row{from + skip});
+    sprite_pixels::draw_image_run<Blend>(to + skip, static_cast<int>(span.to - span.from),
+                                         sprite_pixels::Operated{operation, sprite_pixels::Row{from + skip}});
   }
 }
 
@@ -115,29 +116,26 @@ class ColumnSteps {
   SSEMath::Float4 lanes, advance;
 };
 
-template <ColourOp_e Op>
-void fetch(std::uint32_t* to, int n, const sprite_pixels::Operation<Op>& operation, sprite_pixels::Columns source) {
-  sprite_pixels::draw_run<Op, BlendMode_e::replace>(to, n, operation, source);
-}
-
 template <ColourOp_e Op, BlendMode_e Blend, bool Tested>
 void scaled(const Sprite_c& sprite, const RenderParams_s& params, const SpriteTarget_s& target) {
-  using namespace SSEMath;
   const Scale scale = scale_of(sprite, params, target);
   const Visible& part = scale.part;
   if (part.empty()) return;
   const sprite_pixels::Operation<Op> operation(params.colour);
-  const sprite_pixels::Operation<ColourOp_e::none> done(0);
   const i64 last = i64{sprite.height - 1} * sprite.pitch + sprite.width - 1;
 
   // The columns to take are the same in every row, so they are found once for a strip of the target. The strip's part
   // of an image row is fetched, and meets the colour, only when the row changes.
-  constexpr int strip = 512;
-  int column[strip];
-  alignas(16) std::uint32_t fetched[strip];
+  using Prepared = sprite_pixels::Prepared<Blend>;
+  Prepared prepared;
+  int column[Prepared::capacity];
+  const auto prepare = [&](const unsigned int* from, const int* indices, int n) {
+    const auto* unsigned_indices = reinterpret_cast<const unsigned int*>(indices);
+    prepared.put(n, sprite_pixels::Operated{operation, sprite_pixels::Columns{from, unsigned_indices}});
+  };
   ColumnSteps steps(scale);
-  for (int x = part.x; steps.remaining() > 0; x += strip) {
-    const int n = std::min(strip, steps.remaining());
+  for (int x = part.x; steps.remaining() > 0; x += Prepared::capacity) {
+    const int n = std::min(Prepared::capacity, steps.remaining());
     steps.take(column, n);
     const auto [first_column, last_column] = std::minmax_element(column, column + n);
     const i64 lowest = *first_column;
@@ -145,26 +143,26 @@ void scaled(const Sprite_c& sprite, const RenderParams_s& params, const SpriteTa
 
     std::ptrdiff_t at = pixel_index(x, part.y, target.pitch);
     float row = 0;
-    i64 fetched_from = -1;
+    i64 prepared_from = -1;
     for (int j = 0; j < part.height; ++j, at += target.pitch, row += scale.step_y) {
+      if (j + 2 < part.height) sprite_pixels::fetch_ahead(target.colour + at + 2 * std::ptrdiff_t{target.pitch}, n);
       const i64 from = scale.start + i64{sprite.pitch} * SSEMath::truncate(row);
-      if (from != fetched_from || j == 0) {
-        if (from + lowest >= 0 && from + highest <= last) {
-          fetch(fetched, n, operation, sprite_pixels::Columns{sprite.pixels + from, column});
+      if (from != prepared_from || j == 0) {
+        if (from >= 0 && lowest >= 0 && from + highest <= last) {
+          prepare(sprite.pixels + from, column, n);
         } else {
           // Steps that add up past the image's last pixel take that pixel.
-          int inside[strip];
+          int inside[Prepared::capacity];
           for (int i = 0; i < n; ++i) inside[i] = static_cast<int>(std::clamp<i64>(from + column[i], 0, last));
-          fetch(fetched, n, operation, sprite_pixels::Columns{sprite.pixels, inside});
+          prepare(sprite.pixels, inside, n);
         }
-        fetched_from = from;
+        prepared_from = from;
       }
-      const sprite_pixels::Row source{fetched};
       if constexpr (Tested) {
-        sprite_pixels::draw_run_tested<ColourOp_e::none, Blend>(target.colour + at, target.depth + at, splat(params.z),
-                                                                n, done, source);
+        sprite_pixels::draw_run_tested<Blend>(target.colour + at, target.depth + at, SSEMath::splat(params.z), n,
+                                              prepared);
       } else {
-        sprite_pixels::draw_run<ColourOp_e::none, Blend>(target.colour + at, n, done, source);
+        sprite_pixels::draw_run<Blend>(target.colour + at, n, prepared);
       }
     }
   }
