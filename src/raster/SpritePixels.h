@@ -282,6 +282,7 @@ template <BlendMode_e Blend, class Source>
 VELMARK5_LANE void draw_run(std::uint32_t* to, int n, Source&& source) {
   constexpr Blending<Blend> blend;
   int i = 0;
+#pragma GCC unroll 2
   for (; i + 4 <= n; i += 4) {
     const Int4 d = blend.reads_target ? load_unaligned(to + i) : Int4{};
     store_unaligned(to + i, blend(source(i), d));
