@@ -111,6 +111,9 @@ final class Knot implements Scene {
     double[] normal = {tip[0] - moved[0], tip[1] - moved[1], tip[2] - moved[2]};
     double[] view = unit(new double[] {moved[0], moved[1] + 0.6, moved[2] + 9});
     double facing = dot(view, normal);
+    if (facing > 0.3) {
+      return; // on no face that is seen
+    }
     double[] mirrored = {
       view[0] - 2 * facing * normal[0], view[1] - 2 * facing * normal[1], view[2] - 2 * facing * normal[2]
     };
