@@ -1,4 +1,6 @@
+import java.util.HashMap;
 import java.util.List;
+import java.util.Map;
 import java.util.Set;
 import java.util.function.ToIntFunction;
 import velmark5.Material;
@@ -147,7 +149,7 @@ final class h extends Peer implements Model {
 
   /** The texture mappings as the arrays of the build. */
   private static final class Mappings {
-    final List<TextureMapping> table;
+    final Map<TextureMapping, Integer> numbers = new HashMap<>();
     final byte[] type;
     final short[] p;
     final short[] m;
@@ -162,7 +164,6 @@ final class h extends Peer implements Model {
     final int[] translateZ;
 
     Mappings(List<TextureMapping> mappings) {
-      table = mappings;
       int count = mappings.size();
       type = new byte[count];
       p = new short[count];
@@ -177,13 +178,14 @@ final class h extends Peer implements Model {
       translateY = new int[count];
       translateZ = new int[count];
       for (int i = 0; i < count; i++) {
+        numbers.put(mappings.get(i), i);
         put(i, mappings.get(i));
       }
     }
 
     int indexOf(Material material) {
       boolean mapped = material.texture() != Material.NO_TEXTURE && material.mapping() != null;
-      return mapped ? table.indexOf(material.mapping()) : DEFAULT_MAPPING;
+      return mapped ? numbers.get(material.mapping()) : DEFAULT_MAPPING;
     }
 
     private void put(int i, TextureMapping mapping) {

@@ -187,6 +187,8 @@ final class ja implements Toolkit {
       }
       q(textures, count);
       current = this;
+      // The library counts on from one toolkit to the next.
+      oa();
     }
     this.textures = textures;
     try {

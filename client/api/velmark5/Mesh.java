@@ -2,15 +2,16 @@ package velmark5;
 
 import java.util.ArrayList;
 import java.util.Arrays;
-import java.util.LinkedHashMap;
+import java.util.LinkedHashSet;
 import java.util.List;
-import java.util.Map;
 import java.util.Objects;
+import java.util.Set;
 
 /**
  * A decoded mesh, from which models are made: vertices, faces with their materials, groups for animation, billboards. The
  * x axis points to the right, y downward, z away. A face is seen from the side from which its corners run
- * counter-clockwise.
+ * counter-clockwise. Coordinates count from the point about which the model turns; bounds and radii of models are 16 bits
+ * wide, so vertices stay within 32767 units of it.
  */
 public final class Mesh {
   /** The most vertices, and the most faces, of one mesh. */
@@ -63,7 +64,7 @@ public final class Mesh {
     vertices = List.copyOf(from.vertices);
     faces = List.copyOf(from.faces);
     billboards = List.copyOf(from.billboards);
-    mappings = List.copyOf(from.mappings.keySet());
+    mappings = List.copyOf(from.mappings);
   }
 
   /**
@@ -118,7 +119,7 @@ public final class Mesh {
     private final List<Vertex> vertices = new ArrayList<>();
     private final List<Face> faces = new ArrayList<>();
     private final List<Billboard> billboards = new ArrayList<>();
-    private final Map<TextureMapping, Integer> mappings = new LinkedHashMap<>();
+    private final Set<TextureMapping> mappings = new LinkedHashSet<>();
 
     private Builder() {}
 
@@ -170,26 +171,26 @@ public final class Mesh {
      * @param material what it is made of
      * @param label group
      * @return its number
-     * @throws IllegalArgumentException if the mesh is full, or a number out of range
+     * @throws IllegalArgumentException if the mesh is full, has mappings enough, or lacks a vertex of the face or of its
+     *     material's plane, or the label is out of range
      */
     public int face(int a, int b, int c, Material material, int label) {
       Objects.requireNonNull(material, "material");
-      for (int vertex : new int[] {a, b, c}) {
-        if (vertex < 0 || vertex >= vertices.size()) {
-          throw new IllegalArgumentException("vertex: " + vertex + " of " + vertices.size());
-        }
+      requireVertices(a, b, c);
+      if (material.mapping() instanceof TextureMapping.Plane plane) {
+        requireVertices(plane.origin(), plane.right(), plane.down());
       }
       if (material.mapping() != null && material.texture() != Material.NO_TEXTURE) {
-        mappings.putIfAbsent(material.mapping(), mappings.size());
-        if (mappings.size() > MAX_MAPPINGS) {
+        if (mappings.size() == MAX_MAPPINGS && !mappings.contains(material.mapping())) {
           throw new IllegalArgumentException("mappings: more than " + MAX_MAPPINGS);
         }
+        mappings.add(material.mapping());
       }
       return add("faces", faces, new Face(a, b, c, material, checked(label)));
     }
 
     /**
-     * Adds a quadrangle as two faces.
+     * Adds a quadrangle as two faces, which meet from the first to the third vertex.
      *
      * @param a first vertex
      * @param b second vertex
@@ -227,6 +228,14 @@ public final class Mesh {
      */
     public Mesh build() {
       return new Mesh(this);
+    }
+
+    private void requireVertices(int... numbers) {
+      for (int vertex : numbers) {
+        if (vertex < 0 || vertex >= vertices.size()) {
+          throw new IllegalArgumentException("vertex: " + vertex + " of " + vertices.size());
+        }
+      }
     }
 
     private static <T> int add(String name, List<T> list, T item) {
