@@ -3,6 +3,7 @@
 #include <malloc.h>
 
 #include <algorithm>
+#include <atomic>
 #include <cerrno>
 #include <cstdint>
 #include <cstdlib>
@@ -12,6 +13,7 @@
 
 namespace {
 
+std::atomic<unsigned long> allocations = 0;
 int memalign_countdown = 0;
 int memalign_error = 0;
 bool realloc_fails = false;
@@ -24,13 +26,35 @@ void allocation_failure::fail_memalign(int n, int error) {
   memalign_countdown = n;
   memalign_error = error;
 }
+unsigned long allocation_failure::count() { return allocations; }
 void allocation_failure::fail_realloc(bool fail) { realloc_fails = fail; }
 void allocation_failure::move_realloc(bool move, unsigned int phase) {
   realloc_moves = move;
   realloc_phase = phase;
 }
 
+// operator new(size_t), by its name in each word size.
+#ifdef __x86_64__
+#define VELMARK5_NEW(prefix) prefix##_Znwm
+#else
+#define VELMARK5_NEW(prefix) prefix##_Znwj
+#endif
+
 extern "C" {
+
+void* __real_malloc(std::size_t size);
+void* VELMARK5_NEW(__real_)(std::size_t size);
+void* __wrap_malloc(std::size_t size);
+void* VELMARK5_NEW(__wrap_)(std::size_t size);
+
+void* __wrap_malloc(std::size_t size) {
+  ++allocations;
+  return __real_malloc(size);
+}
+void* VELMARK5_NEW(__wrap_)(std::size_t size) {
+  ++allocations;
+  return VELMARK5_NEW(__real_)(size);
+}
 
 int __real_posix_memalign(void** out, std::size_t alignment, std::size_t size);
 void* __real_realloc(void* p, std::size_t size);
@@ -38,11 +62,13 @@ int __wrap_posix_memalign(void** out, std::size_t alignment, std::size_t size);
 void* __wrap_realloc(void* p, std::size_t size);
 
 int __wrap_posix_memalign(void** out, std::size_t alignment, std::size_t size) {
+  ++allocations;
   if (memalign_countdown > 0 && --memalign_countdown == 0) return memalign_error;
   return __real_posix_memalign(out, alignment, size);
 }
 
 void* __wrap_realloc(void* p, std::size_t size) {
+  ++allocations;
   if (realloc_fails) {
     errno = ENOMEM;
     return nullptr;

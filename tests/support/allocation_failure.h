@@ -1,10 +1,14 @@
-// Failing allocations: the test program routes the library's posix_memalign and realloc through here.
+// Failing and counted allocations: the test program routes the library's posix_memalign, realloc, malloc and operator
+// new through here.
 #pragma once
 
 namespace allocation_failure {
 
 // The call of posix_memalign number `n` from now returns the error code; 0 for none.
 void fail_memalign(int n, int error);
+
+// Allocations since the start, by all threads, that went this way.
+unsigned long count();
 
 // Every realloc returns null, while set.
 void fail_realloc(bool fail);

@@ -1,0 +1,204 @@
+// Random meshes, materials and scenes for the tests of models: each mesh goes to the library and to the slow reference.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <string>
+#include <vector>
+
+#include "model/model.h"
+#include "reference/model_oracle.h"
+#include "support/random.h"
+#include "support/toolkit_fixture.h"
+#include "texture/texturecache.h"
+
+class mesh_fixture : public toolkit_fixture {
+ public:
+  static constexpr int textures = 42;
+  static constexpr int undelivered = 7;  // the client has no pixels for multiples of it
+  using Mesh = oracle::Mesh;
+
+  std::vector<int> refused;  // undelivered textures that were asked for, repeats in a row left out
+  std::function<void()> inside_request;
+
+  void SetUp() override {
+    Java_ja_q(env, peer, java.new_object("source"), textures);
+    Java_ba_sa(env, pool_peer, 0, pool_size);
+    Java_ja_n(env, peer, pool_peer);
+    Java_a_ha(env, resource_peer, 0, 0, 0, 0, 0);
+    ASSERT_EQ(java.take_exception(), "");
+    test_random random(77);
+    for (int id = 0; id < textures; ++id) {
+      test_random same = random;
+      attributes(id, random, nullptr);
+      std::vector<jint> pixels(16384);
+      for (jint& p : pixels) p = static_cast<jint>(random.one_in(6) ? 0 : random.word());
+      images.push_back({same, java.new_ints(pixels)});
+    }
+    java.request_texture = [this](jshort id) -> jboolean {
+      if (inside_request) inside_request();
+      if (id % undelivered == 0) {
+        if (refused.empty() || refused.back() != id) refused.push_back(id);
+        return 0;
+      }
+      test_random same = images[id].attributes;
+      attributes(id, same, images[id].pixels);
+      return 1;
+    };
+  }
+
+  void TearDown() override {
+    if (java.nativeid(resource_peer) != 0) Java_a_R(env, resource_peer, java.nativeid(resource_peer));
+    toolkit_fixture::TearDown();
+  }
+
+  // --- Meshes -----------------------------------------------------------------------------------------------------
+
+  // drawn: without shading types that leave the colour open, and with billboards that show nothing.
+  static Mesh random_mesh(test_random& r, bool drawn, int most_faces = 40) {
+    Mesh m;
+    const auto list = [&r]<class T>(Mesh::array<T>& out, int n, int share, auto value) {
+      if (share > 1 && !r.one_in(share)) return;
+      out.emplace();
+      for (int i = 0; i < n; ++i) out->push_back(static_cast<T>(value()));
+    };
+    const auto range = [&r](int low, int high) { return [&r, low, high] { return r.between(low, high); }; };
+    m.vertexcount = r.between(4, 60);
+    m.meshvertexcount = r.one_in(3) ? r.between(4, m.vertexcount) : m.vertexcount;
+    for (auto* axis : {&m.x, &m.y, &m.z}) list(*axis, m.vertexcount, 1, range(-120, 120));
+    // Four points that span a volume.
+    for (int i = 0; i < 4; ++i) (*m.x)[i] = i == 1 ? 90 : 0, (*m.y)[i] = i == 2 ? 95 : 0, (*m.z)[i] = i == 3 ? 99 : 0;
+    const int top_label = r.one_in(5) ? 255 : 9;
+    list(m.vertexlabels, m.vertexcount, 2, range(-2, top_label));
+    list(m.vmask, r.between(0, 70), 2, range(-32768, 32767));
+
+    const int n = m.inputfacecount = r.between(drawn ? 1 : 0, most_faces);
+    for (auto* corner : {&m.a, &m.b, &m.c}) list(*corner, n, 1, range(0, m.meshvertexcount - 1));
+    list(m.ftype, n, 2, [&] { return r.one_in(5) ? 2 : r.one_in(8) && !drawn ? r.between(3, 255) : r.between(0, 1); });
+    list(m.fpriority, n, 2, range(-128, 127));
+    list(m.falpha, n, 2, [&] { return r.one_in(8) ? 255 : r.one_in(2) ? 0 : r.between(1, 254); });
+    list(m.fhsl, n, 1, range(-32768, 32767));
+    if (!r.one_in(5)) list(m.ftex, n, 1, [&] { return r.one_in(4) ? -1 : r.between(0, textures - 1); });
+    list(m.fmask, n, 2, range(-32768, 32767));
+    m.priority = static_cast<std::int8_t>(r.between(-128, 127));
+
+    const int k = m.mappingcount = r.between(0, 5);
+    if (k > 0 || r.one_in(2)) {
+      list(m.fmapping, n, r.one_in(4) ? 2 : 1, [&] { return k == 0 || r.one_in(5) ? -1 : r.between(0, k - 1); });
+    }
+    list(m.mappingtype, k, 1, range(0, 4));
+    for (auto* axis : {&m.mappingp, &m.mappingm, &m.mappingn}) axis->emplace();
+    for (int i = 0; i < k; ++i) {
+      float x = r.real(-1, 1), y = r.real(-1, 1), z = r.real(-1, 1);
+      if (r.one_in(4)) x = z = 0;
+      const float scale = 32767 / std::sqrt(x * x + y * y + z * z);
+      const bool plane = (*m.mappingtype)[i] == 0;
+      const int first = r.between(0, 3);
+      m.mappingp->push_back(static_cast<std::int16_t>(plane ? first : static_cast<int>(x * scale)));
+      m.mappingm->push_back(static_cast<std::int16_t>(plane ? (first + 1) % 4 : static_cast<int>(y * scale)));
+      m.mappingn->push_back(static_cast<std::int16_t>(plane ? (first + 2) % 4 : static_cast<int>(z * scale)));
+    }
+    for (auto* scale : {&m.mappingscalex, &m.mappingscaley, &m.mappingscalez}) {
+      list(*scale, k, 1, [&] { return r.between(1, 3000) * (r.one_in(4) ? -1 : 1); });
+      if (scale == &m.mappingscalex) {
+        for (int i = 0; i < k; ++i)
+          if ((*m.mappingtype)[i] == 1 && r.one_in(3)) (**scale)[i] = 0;
+      }
+    }
+    list(m.mappingrotation, k, 1, range(-128, 127));
+    list(m.mappingdirection, k, 1, range(0, 5));
+    for (auto* t : {&m.mappingtranslatex, &m.mappingtranslatey, &m.mappingtranslatez}) list(*t, k, 1, range(-999, 999));
+
+    m.emittercount = r.between(0, 2);
+    m.effectorcount = r.between(0, 2);
+    const int points = 3 * m.emittercount + m.effectorcount;
+    list(m.pslist, points + r.between(0, 2), points > 0 ? 1 : 2, range(0, m.vertexcount - 1));
+    m.functionmask = static_cast<int>(r.word() & 0xFFFFF);
+    m.flags = static_cast<int>(r.word());
+    m.ambient = r.between(0, 300);
+    m.contrast = r.between(200, 2000);
+    const int billboards = n > 0 && r.one_in(2) ? r.between(0, 3) : 0;
+    list(m.billboarddata, billboards * 8 + r.between(0, 7), billboards > 0 ? 1 : 2, [&] { return 0; });
+    for (int j = 0; j < billboards; ++j) {
+      const int record[] = {
+          r.between(0, n - 1), r.between(0, 65535), r.between(0, 65535), drawn ? -1 : r.between(0, 41),
+          r.between(0, 4),     r.between(0, 2),     r.between(0, 2)};
+      std::copy(std::begin(record), std::end(record), m.billboarddata->begin() + 7 * j);
+    }
+    // Sometimes labels for fewer faces, or for more things than there are.
+    const int labels = n + billboards + (r.one_in(4) ? r.between(-n, 5) : 0);
+    list(m.facelabels, labels, 2, range(-2, top_label));
+    return m;
+  }
+
+  jobject build(const Mesh& m) {
+    const jobject object = java.new_object("h");
+    build_into(object, m);
+    return object;
+  }
+
+  void build_into(jobject object, const Mesh& m) {
+    const auto ints = [this](const Mesh::ints& v) { return v ? java.new_ints({v->begin(), v->end()}) : nullptr; };
+    const auto shorts = [this](const Mesh::shorts& v) { return v ? java.new_shorts({v->begin(), v->end()}) : nullptr; };
+    const auto bytes = [this](const Mesh::bytes& v) { return v ? java.new_bytes({v->begin(), v->end()}) : nullptr; };
+    Java_h_U(env, object, nullptr, pool_peer, m.vertexcount, m.meshvertexcount, ints(m.x), ints(m.y), ints(m.z),
+             ints(m.vertexlabels), shorts(m.vmask), m.inputfacecount, shorts(m.a), shorts(m.b), shorts(m.c),
+             bytes(m.ftype), bytes(m.fpriority), bytes(m.falpha), bytes(m.fmapping), shorts(m.fhsl), shorts(m.ftex),
+             ints(m.facelabels), m.priority, shorts(m.fmask), m.mappingcount, bytes(m.mappingtype), shorts(m.mappingp),
+             shorts(m.mappingm), shorts(m.mappingn), ints(m.mappingscalex), ints(m.mappingscaley),
+             ints(m.mappingscalez), bytes(m.mappingrotation), bytes(m.mappingdirection), ints(m.mappingtranslatex),
+             ints(m.mappingtranslatey), ints(m.mappingtranslatez), ints(m.pslist), m.emittercount, m.effectorcount,
+             m.functionmask, m.flags, m.ambient, m.contrast, ints(m.billboarddata));
+  }
+
+  model& get(jobject object) const { return *native<model>(object); }
+
+  // --- Scenes -----------------------------------------------------------------------------------------------------
+
+  using Numbers = std::vector<jfloat>;
+
+  // A turn about y and then about x, a scale, and a displacement.
+  static Numbers placed(float turn, float tilt, float scale, float x, float y, float z) {
+    const float c = std::cos(turn) * scale, s = std::sin(turn) * scale, p = std::cos(tilt), q = std::sin(tilt);
+    return {c, s * q, -s * p, 0, 0, p * scale, q * scale, 0, s, -c * q, c * p, 0, x, y, z, 1};
+  }
+
+  void perspective(float near, float far) {
+    const float range = (far + near) / (far - near);
+    Java_ja_wa(env, peer,
+               java.new_floats({1, 0, 0, 0, 0, 1.4f, 0, 0, 0, 0, range, 1, 0, 0, -2 * far * near / (far - near), 0}));
+  }
+
+  void draw(jobject mesh, const Numbers& world, jintArray result = nullptr) {
+    Java_a_wa(env, resource_peer, java.nativeid(resource_peer), mesh, java.new_floats(world), result);
+  }
+
+  const jobject resource_peer = java.new_object("a");
+
+ private:
+  // The attributes of a texture: of its id alone, or with pixels. The kind of alpha of the last one is another there.
+  void attributes(int id, test_random& r, jintArray pixels) {
+    const auto flag = [&r](int n) { return static_cast<jboolean>(r.one_in(n)); };
+    const auto byte = [&r](bool some) { return static_cast<jbyte>(some ? r.between(-128, 127) : 0); };
+    const jint alpha = id == textures - 1 && pixels != nullptr ? 2 : id % 3;
+    const auto hsl = static_cast<jshort>(r.between(-32768, 32767));
+    const jbyte lighting = static_cast<jbyte>(r.one_in(5) ? 6 : 1);
+    const jbyte grey = byte(r.one_in(2)), bright = byte(r.one_in(2)), u = byte(r.one_in(4)), v = byte(r.one_in(4));
+    const jboolean flat = flag(5), hidden = flag(9), wrap_u = flag(3), wrap_v = flag(3);
+    const jshort name = static_cast<jshort>(id);
+    if (pixels == nullptr) {
+      Java_ja_V(env, peer, name, hsl, alpha, lighting, 0, 0, 0, grey, bright, u, v, flat, hidden, 0, wrap_u, wrap_v, 0,
+                0, 0, 0);
+    } else {
+      Java_ja_F(env, peer, name, pixels, hsl, alpha, lighting, 0, 0, 0, grey, bright, u, v, flat, hidden, 0, wrap_u,
+                wrap_v, 0, 0, 0, 0);
+    }
+  }
+
+  struct image {
+    test_random attributes;
+    jintArray pixels;
+  };
+  std::vector<image> images;
+};
