@@ -6,6 +6,7 @@ import velmark5.Colour;
 import velmark5.Font;
 import velmark5.MemoryPool;
 import velmark5.Spans;
+import velmark5.Sprite;
 import velmark5.ThreadResource;
 import velmark5.Toolkit;
 
@@ -14,13 +15,13 @@ final class Radar implements Scene {
   private static final int GLASS = 0xFF04140F;
   private static final int PHOSPHOR = 0xFF4DFFB0;
   private static final int TAIL = 380;
-  private static final int ECHOES = 9;
   private static final double TURNS_PER_SECOND = 0.22;
 
   private final Toolkit toolkit;
   private final MemoryPool pool;
   private final ThreadResource resource;
   private ClippingMask disc;
+  private Sprite knot;
   private int centreX;
   private int centreY;
   private int radius;
@@ -41,6 +42,7 @@ final class Radar implements Scene {
       disc.close();
     }
     disc = toolkit.createMask(pool, Spans.ellipse(2 * radius + 1, 2 * radius + 1));
+    paintKnot();
   }
 
   @Override
@@ -62,8 +64,28 @@ final class Radar implements Scene {
         3,
         BlendMode.ALPHA);
     paintScale();
-    paintEchoes(beam);
+    knot.draw(
+        centreX - knot.width() / 2, centreY - knot.height() / 2, disc, centreX - radius, centreY - radius);
+    paintEchoes(beam, seconds);
     paintShine();
+  }
+
+  /** The sign of the knot, three rings in a sprite. */
+  private void paintKnot() {
+    if (knot != null) {
+      knot.close();
+    }
+    int size = Math.max(5, radius / 5);
+    knot = toolkit.createSprite(2 * size + 1, 2 * size + 1);
+    toolkit.drawTo(knot, null);
+    toolkit.clear(Colour.TRANSPARENT);
+    for (int i = 0; i < 72; i++) {
+      double t = 2 * Math.PI * i / 72;
+      double r = size * (0.62 + 0.24 * Math.cos(3 * t));
+      int x = size + (int) Math.round(r * Math.cos(2 * t));
+      int y = size + (int) Math.round(r * Math.sin(2 * t));
+      toolkit.fillRect(x, y, 2, 2, Colour.withAlpha(PHOSPHOR, 150), BlendMode.REPLACE);
+    }
   }
 
   private void paintRim() {
@@ -123,11 +145,12 @@ final class Radar implements Scene {
     }
   }
 
-  /** Points that light up as the beam passes and fade until it comes round again. */
-  private void paintEchoes(double beam) {
-    for (int i = 0; i < ECHOES; i++) {
-      double angle = 2 * Math.PI * Noise.hash(i * 3 + 50) + 0.015 * beam * (i % 3 - 1);
-      double r = radius * (0.22 + 0.62 * Noise.hash(i * 3 + 51));
+  /** The rocks around the knot from above: they light up as the beam passes and fade until it comes round again. */
+  private void paintEchoes(double beam, double seconds) {
+    for (int i = 0; i < Stones.COUNT; i++) {
+      double[] at = Stones.place(i, seconds);
+      double angle = Math.atan2(-at[2], at[0]);
+      double r = radius * 0.9 * Math.hypot(at[0], at[2]) / Stones.REACH;
       double since = (beam - angle) / (2 * Math.PI);
       double light = Math.pow(1 - (since - Math.floor(since)), 2.5);
       int x = centreX + (int) (r * Math.cos(angle));

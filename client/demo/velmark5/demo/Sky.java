@@ -187,6 +187,8 @@ final class Sky implements Scene {
     double x = width * (0.12 + 0.5 * Noise.hash(number + 400)) + age * width * 0.22;
     double y = height * (0.06 + 0.1 * Noise.hash(number + 500)) + age * height * 0.13;
     double light = Math.sin(Math.PI * age / 0.9);
+    // It lights up the whole sky for a moment.
+    toolkit.fillRect(0, 0, width, horizon, Colour.scale(0xFF6F90C0, 0.16 * light * light), BlendMode.ADD);
     for (int i = 0; i < 16; i++) {
       double a = i * width * 0.005;
       double b = (i + 1) * width * 0.005;

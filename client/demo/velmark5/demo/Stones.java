@@ -22,7 +22,12 @@ import velmark5.Toolkit;
  * of the scene, those in front of it by another.
  */
 final class Stones implements Scene {
-  private static final int COUNT = 9;
+  /** How many rocks there are. */
+  static final int COUNT = 9;
+
+  /** No rock is farther from the knot than this. */
+  static final int REACH = 400;
+
   private static final int RADIUS = 27;
   private static final double DISTANCE = 900;
 
@@ -137,6 +142,15 @@ final class Stones implements Scene {
     height = newHeight;
   }
 
+  /** Where a rock is at a moment, from the knot's middle: right, down, away, in the world's units. */
+  static double[] place(int rock, double seconds) {
+    double angle = seconds * 0.32 + rock * 2 * Math.PI / COUNT + 0.3 * Math.sin(rock * 3.0);
+    double orbit = 350 + 35 * Math.sin(rock * 2.3);
+    return new double[] {
+      orbit * Math.cos(angle), 60 * Math.sin(angle + 0.6) + 18 * Math.sin(seconds + rock), -orbit * Math.sin(angle)
+    };
+  }
+
   @Override
   public void paint(double seconds) {
     toolkit.resetViewport();
@@ -148,16 +162,12 @@ final class Stones implements Scene {
     toolkit.setSun(new Sun(0xFFCFE0FF, 1.1f, 0.4f, 0.6f, -0.7f, -0.5f));
     resource.begin();
     for (int i = 0; i < COUNT; i++) {
-      double angle = seconds * 0.32 + i * 2 * Math.PI / COUNT + 0.3 * Math.sin(i * 3.0);
-      double orbit = 350 + 35 * Math.sin(i * 2.3);
-      double z = -orbit * Math.sin(angle);
-      if (z < 0 == inFront) {
+      double[] at = place(i, seconds);
+      if (at[2] < 0 == inFront) {
         Matrix place =
             Matrix.rotationY(seconds * (0.5 + 0.2 * (i % 3)) + i)
                 .then(Matrix.rotationX(0.5 * i + seconds * 0.2))
-                .then(
-                    Matrix.translation(
-                        orbit * Math.cos(angle), 60 * Math.sin(angle + 0.6) + 18 * Math.sin(seconds + i), z));
+                .then(Matrix.translation(at[0], at[1], at[2]));
         resource.draw(models.get(i), place);
       }
     }
