@@ -1,6 +1,7 @@
 // Normals, and the baked half of the lighting.
 #include <algorithm>
 #include <cmath>
+#include <utility>
 
 #include "maths/colourutils.h"
 #include "model/model.h"
@@ -50,8 +51,10 @@ unsigned int brightened(unsigned int rgb, unsigned int b) {
 
 void model::calculatenormals() {
   pool->monitor_enter();
-  vnormal = sharedarray<Vector4_s>::allocate(*pool, static_cast<unsigned int>(meshvertexcount));
+  // Both or neither: one without the other would pass for complete.
+  auto vertices = sharedarray<Vector4_s>::allocate(*pool, static_cast<unsigned int>(meshvertexcount));
   fnormal = sharedarray<Vector4_s>::allocate(*pool, facecount);
+  vnormal = std::move(vertices);
   std::fill_n(vnormal.data(), meshvertexcount, Vector4_s{0, 0, 0, 0});
   for (int f = 0; f < facecount; ++f) {
     const Vector4_s n = face_normal(vpos[fa[f]], vpos[fb[f]], vpos[fc[f]]);

@@ -177,11 +177,11 @@ class mesh_fixture : public toolkit_fixture {
   const jobject resource_peer = java.new_object("a");
 
  private:
-  // The attributes of a texture: of its id alone, or with pixels. The kind of alpha of the last one is another there.
+  // The attributes of a texture: of its id alone, or with pixels. The last one blends, which only its pixels tell.
   void attributes(int id, test_random& r, jintArray pixels) {
     const auto flag = [&r](int n) { return static_cast<jboolean>(r.one_in(n)); };
     const auto byte = [&r](bool some) { return static_cast<jbyte>(some ? r.between(-128, 127) : 0); };
-    const jint alpha = id == textures - 1 && pixels != nullptr ? 2 : id % 3;
+    const jint alpha = id == textures - 1 ? (pixels != nullptr ? 2 : 0) : id % 3;
     const auto hsl = static_cast<jshort>(r.between(-32768, 32767));
     const jbyte lighting = static_cast<jbyte>(r.one_in(5) ? 6 : 1);
     const jbyte grey = byte(r.one_in(2)), bright = byte(r.one_in(2)), u = byte(r.one_in(4)), v = byte(r.one_in(4));

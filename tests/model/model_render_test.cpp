@@ -217,6 +217,91 @@ TEST_F(ModelRenderTest, SteadyFramesAllocateNothing) {
   for (jobject mesh : meshes) Java_h_ma(env, mesh);
 }
 
+// Memory that runs out at any allocation of a build or of a first draw: nothing is lost, and the next draw is whole.
+TEST_F(ModelRenderTest, ShortPoolsLoseNothing) {
+  test_random r(16);
+  Mesh mesh = random_mesh(r, true);
+  while (mesh.inputfacecount < 30 || !mesh.ftype || mesh.mappingcount > 0) mesh = random_mesh(r, true);
+  const auto new_target = [this] {
+    test_random state(5);
+    random_state(state);
+    random_target(state, true, true);
+  };
+  const Numbers world = placed(2, 0, 1, 0, 0, 350);
+  const jobject object = build(mesh);
+  draw(object, world);  // fetches the textures
+  new_target();
+  draw(object, world);
+  const auto expected = colour.copy();
+  Java_h_ma(env, object);
+
+  int builds = 0, draws = 0;
+  for (unsigned int room = 0; room < 9000; room += 16) {
+    SCOPED_TRACE(room);
+    auto filler = sharedarray<unsigned char>::allocate(pool(), pool_size - room);
+    allocation_failure::fail_realloc(true);
+    build_into(object, mesh);
+    const bool built = java.nativeid(object) != 0;
+    if (built) draw(object, world);
+    allocation_failure::fail_realloc(false);
+    const std::string exception = java.take_exception();
+    if (!exception.empty()) {
+      EXPECT_EQ(exception.substr(0, 26), "java.lang.OutOfMemoryError");
+      ++(built ? draws : builds);
+    }
+    filler = {};
+    if (built) {
+      new_target();
+      draw(object, world);
+      ASSERT_EQ(colour.copy(), expected);
+      Java_h_ma(env, object);
+    }
+    ASSERT_EQ(Java_ja_za(env, peer), 0);
+  }
+  EXPECT_GT(builds, 20);
+  EXPECT_GT(draws, 5);
+}
+
+// One triangle that faces the viewer, black and flat.
+TEST_F(ModelRenderTest, Quirks) {
+  Mesh mesh;
+  mesh.vertexcount = mesh.meshvertexcount = 3;
+  mesh.x = {{-5, 100, -5}}, mesh.y = {{-60, 60, 60}}, mesh.z = {{0, 0, 0}};
+  mesh.inputfacecount = 1;
+  mesh.a = {{0}}, mesh.b = {{2}}, mesh.c = {{1}};
+  mesh.fhsl = {{0}};
+  mesh.ftype = {{1}};
+  make_target(width, height);
+  perspective(50, 1500);
+  Java_ja_IA(env, peer, -50);
+  const jobject object = build(mesh);
+  EXPECT_EQ(Java_h_RA(env, object), 65531) << "negative bounds arrive as 16 bits";
+  const auto largest = [this] {
+    const auto pixels = colour.copy();
+    return *std::max_element(pixels.begin(), pixels.end());
+  };
+
+  depth.fill(1);
+  draw(object, placed(0, 0, 1, 0, 0, 300));
+  EXPECT_EQ(largest(), 0xFF040404u) << "no light leaves less than 4";
+
+  const jintArray result = java.new_ints({1, 2, 3, 4, 5, 6});
+  draw(object, placed(0, 0, 1, 0, 0, -600), result);
+  EXPECT_EQ(java.ints(result), (std::vector<jint>{1, 2, 3, 4, 5, 6})) << "a culled model leaves the array alone";
+
+  // Wholly in the fog at one corner: gone, though the others are clear.
+  make_target(width, height);
+  depth.fill(1);
+  Java_ja_M(env, peer, 60, 0xFFFFFF, 120, 0);
+  draw(object, placed(0, 0, 1, 0, -1, 300));
+  EXPECT_NE(largest(), 0u);
+  make_target(width, height);
+  depth.fill(1);
+  draw(object, placed(0, 0, 1, 0, 0, 300));
+  EXPECT_EQ(largest(), 0u);
+  Java_h_ma(env, object);
+}
+
 TEST_F(ModelRenderTest, ModelsOfAPoolThatIsGone) {
   test_random r(4);
   const jobject object = build(random_mesh(r, true));
