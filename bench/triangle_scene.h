@@ -1,5 +1,5 @@
-// The triangles that the benchmarks draw, here and in the peer renderer: random turns, depths and colours, all of one
-// area, wholly inside the target. They come in patches of neighbours, as the triangles of a mesh do.
+// The triangles that the benchmarks draw, here and in the peer renderer: random turns, colours and order of depth, all
+// of one area, wholly inside the target. They come in patches of neighbours, as the triangles of a mesh do.
 #pragma once
 
 #include <time.h>
@@ -61,7 +61,7 @@ inline std::vector<triangle> make(int pixels, bool half_alpha) {
       patch_x = uniform(0, 1);
       patch_y = uniform(0, 1);
     }
-    const double turn = uniform(0, 6.2832);
+    const double turn = uniform(0, 6.2832), depth = uniform(0.2, 0.8);
     double x[3], y[3];
     for (int i = 0; i < 3; ++i) {
       const double angle = turn + 2.0944 * i + uniform(-0.5, 0.5);
@@ -78,7 +78,7 @@ inline std::vector<triangle> make(int pixels, bool half_alpha) {
       t[static_cast<std::size_t>(i)] = {
           static_cast<float>(centre_x + scale * x[i]),
           static_cast<float>(centre_y + scale * y[i]),
-          static_cast<float>(uniform(0.2, 0.9)),
+          static_cast<float>(depth + uniform(0, 0.1)),
           static_cast<float>(64 + scale * x[i] * 2),
           static_cast<float>(64 + scale * y[i] * 2),
           (static_cast<std::uint32_t>(random()) & 0xFFFFFFu) | (half_alpha ? 0x80000000u : 0xFF000000u)};

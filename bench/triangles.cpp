@@ -44,8 +44,10 @@ constexpr render_function instances[] = {
 // The target, the textures and one scene.
 class scene {
  public:
-  scene(kind what, int size)
-      : what_(what), size_(size), triangles_(triangle_scene::make(size, what == kind::textured_translucent)) {
+  scene(kind what, int size) : what_(what), size_(size) {
+    for (const auto& t : triangle_scene::make(size, what == kind::textured_translucent)) {
+      for (const auto& v : t) vertices_.push_back({{v.x, v.y, v.z, 1}, {v.u, v.v, 0, 0}, v.colour});
+    }
     // Whole cache lines, as a canvas has them.
     colour_ = aligned(colour_memory_);
     depth_ = aligned(depth_memory_);
@@ -81,16 +83,16 @@ class scene {
     t.flatcolour = 0;
     for (std::size_t n = 0; n < count(); n += step) {
       for (std::size_t i = 0; i < 3; ++i) {
-        const triangle_scene::vertex& v = triangles_[n][i];
-        t.vertex[i] = {v.x, v.y, v.z, 1};
+        const vertex& v = vertices_[3 * n + i];
+        t.vertex[i] = v.position;
         t.colour[i] = vertex_colour(v.colour);
-        t.texcoord[i] = {v.u, v.v, 0, 0};
+        t.texcoord[i] = v.texcoord;
       }
       render(t);
     }
   }
 
-  std::size_t count() const { return triangles_.size(); }
+  std::size_t count() const { return vertices_.size() / 3; }
 
   long covered() {
     clear();
@@ -107,9 +109,15 @@ class scene {
     return reinterpret_cast<T*>((reinterpret_cast<std::uintptr_t>(memory.data()) + 63) & ~std::uintptr_t{63});
   }
 
+  // A vertex as the renderers keep it after projection.
+  struct vertex {
+    Vector4_s position, texcoord;
+    std::uint32_t colour;
+  };
+
   kind what_;
   int size_;
-  std::vector<triangle_scene::triangle> triangles_;
+  std::vector<vertex> vertices_;  // three of each triangle
   std::vector<unsigned int> colour_memory_;
   std::vector<float> depth_memory_;
   unsigned int* colour_;
