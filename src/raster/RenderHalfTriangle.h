@@ -20,7 +20,7 @@ namespace Rasterizer_n {
 
 // --- Tables ---------------------------------------------------------------------------------------------------------
 
-inline constexpr std::uint32_t F = 0xFFFFFFFFu;
+inline constexpr std::uint32_t F = 0xFFFFFFFFu;  // a lane that is set
 
 // Masks of the last group, by the pixels left (0: the span ends with the group), and of the first group, by the pixels
 // of the group before the span.
