@@ -1,7 +1,8 @@
 #include "toolkit/font_alpha.h"
 
-void font_alpha::plotletter(short glyph, int x, int y, unsigned int colour, bool solid) const {
-  plotletter(glyph, x, y, colour, solid, nullptr, 0, 0);
+void font_alpha::plotletter(short glyph, int x, int y, unsigned int colour, bool) const {
+  if (toolkit::m_pInstance->colourbuffer == nullptr) return;
+  plot_upright(glyphs, metrics, glyph, x, y, glyph::coverage_ink(colour));
 }
 
 void font_alpha::plotletter(short glyph, int x, int y, unsigned int colour, bool, const clippingmask* mask, int mask_x,

@@ -25,16 +25,41 @@ inline glyph::bitmap glyph_bitmap(const glyph_bitmaps& glyphs, const font_metric
   return {glyphs[i].data(), width, height};
 }
 
-// Draws the glyph upright with the pen at (x, y), through a mask if there is one.
+// A glyph that stands upright: its bitmap, without bytes when it cannot be drawn, and the top left of its box.
+struct upright_glyph {
+  VELMARK5_LANE upright_glyph(const glyph_bitmaps& glyphs, const font_metrics& metrics, short glyph, int pen_x,
+                              int pen_y)
+      : bitmap(glyph_bitmap(glyphs, metrics, glyph)) {
+    if (bitmap.bytes == nullptr) return;
+    if (glyph >= metrics.x_offsets.count() || glyph >= metrics.y_offsets.count()) {
+      bitmap.bytes = nullptr;
+      return;
+    }
+    x = static_cast<long long>(pen_x) + metrics.x_offsets[glyph];
+    y = static_cast<long long>(pen_y) + metrics.y_offsets[glyph];
+  }
+  glyph::bitmap bitmap;
+  long long x = 0, y = 0;
+};
+
+// Draws the glyph upright with the pen at (x, y).
 template <class Ink>
-void plot_upright(const glyph_bitmaps& glyphs, const font_metrics& metrics, short glyph, int x, int y, const Ink& ink,
-                  const clippingmask* mask = nullptr, int mask_x = 0, int mask_y = 0) {
-  const glyph::bitmap bitmap = glyph_bitmap(glyphs, metrics, glyph);
-  if (bitmap.bytes == nullptr || glyph >= metrics.x_offsets.count() || glyph >= metrics.y_offsets.count()) return;
-  const long long px = static_cast<long long>(x) + metrics.x_offsets[glyph];
-  const long long py = static_cast<long long>(y) + metrics.y_offsets[glyph];
-  glyph::draw(*toolkit::m_pInstance, px, py, bitmap.width, bitmap.height, ink, glyph::upright_rows(bitmap), mask,
-              mask_x, mask_y);
+VELMARK5_LANE void plot_upright(const glyph_bitmaps& glyphs, const font_metrics& metrics, short glyph, int x, int y,
+                                const Ink& ink) {
+  const upright_glyph g(glyphs, metrics, glyph, x, y);
+  if (g.bitmap.bytes == nullptr) return;
+  glyph::draw(*toolkit::m_pInstance, g.x, g.y, g.bitmap.width, g.bitmap.height, ink, glyph::upright_rows(g.bitmap));
+}
+
+// The same through a mask; a null mask is none.
+template <class Ink>
+VELMARK5_LANE void plot_upright(const glyph_bitmaps& glyphs, const font_metrics& metrics, short glyph, int x, int y,
+                                const Ink& ink, const clippingmask* mask, int mask_x, int mask_y) {
+  if (mask == nullptr) return plot_upright(glyphs, metrics, glyph, x, y, ink);
+  const upright_glyph g(glyphs, metrics, glyph, x, y);
+  if (g.bitmap.bytes == nullptr) return;
+  glyph::draw_masked(*toolkit::m_pInstance, g.x, g.y, g.bitmap.width, g.bitmap.height, ink,
+                     glyph::upright_rows(g.bitmap), *mask, mask_x, mask_y);
 }
 
 // Draws the glyph turned a quarter counter-clockwise; (x, y) is the top left of the turned box.

@@ -16,8 +16,8 @@ void with_ink(unsigned int colour, Draw draw) {
 
 }  // namespace
 
-void font_mono::plotletter(short glyph, int x, int y, unsigned int colour, bool solid) const {
-  plotletter(glyph, x, y, colour, solid, nullptr, 0, 0);
+void font_mono::plotletter(short glyph, int x, int y, unsigned int colour, bool) const {
+  with_ink(colour, [&](const auto& ink) { plot_upright(glyphs, metrics, glyph, x, y, ink); });
 }
 
 void font_mono::plotletter(short glyph, int x, int y, unsigned int colour, bool, const clippingmask* mask, int mask_x,

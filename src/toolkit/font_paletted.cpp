@@ -16,7 +16,7 @@ void with_ink(const sharedarray<unsigned int>& palette, unsigned int colour, boo
 }  // namespace
 
 void font_paletted::plotletter(short glyph, int x, int y, unsigned int colour, bool solid) const {
-  plotletter(glyph, x, y, colour, solid, nullptr, 0, 0);
+  with_ink(palette, colour, solid, [&](const auto& ink) { plot_upright(glyphs, metrics, glyph, x, y, ink); });
 }
 
 void font_paletted::plotletter(short glyph, int x, int y, unsigned int colour, bool solid, const clippingmask* mask,

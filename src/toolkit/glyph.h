@@ -24,20 +24,20 @@ struct bitmap {
 
 // --- Inks: what four glyph bytes, packed lowest first, make of four target pixels ------------------------------------
 
-// The four bytes, one to a lane.
-VELMARK5_LANE Int4 byte_lanes(std::uint32_t bytes) {
-  const __m128i zero = _mm_setzero_si128();
-  return {_mm_unpacklo_epi16(_mm_unpacklo_epi8(_mm_cvtsi32_si128(static_cast<int>(bytes)), zero), zero)};
+// The four bytes, each as both words of its pixel's lane.
+VELMARK5_LANE Int4 byte_pairs(std::uint32_t bytes) {
+  const __m128i words = _mm_unpacklo_epi8(_mm_cvtsi32_si128(static_cast<int>(bytes)), _mm_setzero_si128());
+  return {_mm_unpacklo_epi16(words, words)};
 }
 
 // All bits where the glyph byte is 0.
-VELMARK5_LANE Int4 holes(Int4 bytes) { return SSEMath::equal(bytes, SSEMath::splat(0u)); }
+VELMARK5_LANE Int4 holes(Int4 pairs) { return SSEMath::equal(pairs, SSEMath::splat(0u)); }
 
 // The colour word as it stands, alpha included.
 struct opaque_ink {
   explicit opaque_ink(unsigned int word) : colour(SSEMath::splat(word)) {}
   VELMARK5_LANE Int4 operator()(Int4 d, std::uint32_t bytes) const {
-    return SSEMath::select(holes(byte_lanes(bytes)), d, colour);
+    return SSEMath::select(holes(byte_pairs(bytes)), d, colour);
   }
   Int4 colour;
 };
@@ -51,26 +51,27 @@ struct blended_ink {
         rest(SSEMath::splat_word(static_cast<std::uint16_t>(255 - (word >> 24)))) {}
   VELMARK5_LANE Int4 operator()(Int4 d, std::uint32_t bytes) const {
     const Int4 channels = d & SSEMath::splat(0xFFFFFFu);
-    const Word8 low = SSEMath::shift_right<8>(SSEMath::widen_low(channels) * rest) + source;
-    const Word8 high = SSEMath::shift_right<8>(SSEMath::widen_high(channels) * rest) + source;
-    return SSEMath::select(holes(byte_lanes(bytes)), d, SSEMath::narrow(low, high));
+    // The high half of (d << 8) * rest.
+    const Word8 low = SSEMath::mulhi(SSEMath::widen_low_shifted(channels), rest) + source;
+    const Word8 high = SSEMath::mulhi(SSEMath::widen_high_shifted(channels), rest) + source;
+    return SSEMath::select(holes(byte_pairs(bytes)), d, SSEMath::narrow(low, high));
   }
   Word8 source, rest;
 };
 
 // Per colour channel, with the glyph byte g as coverage: (d * (256 - g) >> 8) + (c * g >> 8). The alpha byte becomes 0.
 struct coverage_ink {
-  explicit coverage_ink(unsigned int word) : colour(SSEMath::widen_low(SSEMath::splat(word & 0xFFFFFF))) {}
+  explicit coverage_ink(unsigned int word) : colour(SSEMath::widen_low_shifted(SSEMath::splat(word & 0xFFFFFF))) {}
   VELMARK5_LANE Int4 operator()(Int4 d, std::uint32_t bytes) const {
-    const Int4 g = byte_lanes(bytes);
-    const Int4 pairs{_mm_or_si128(g.v, _mm_slli_epi32(g.v, 16))};
-    const Int4 channels = d & SSEMath::splat(0xFFFFFFu);
-    const Word8 low = blend(SSEMath::widen_low(channels), {_mm_unpacklo_epi32(pairs.v, pairs.v)});
-    const Word8 high = blend(SSEMath::widen_high(channels), {_mm_unpackhi_epi32(pairs.v, pairs.v)});
-    return SSEMath::select(holes(g), d, SSEMath::narrow(low, high));
+    const Int4 g = byte_pairs(bytes);
+    const Word8 low = blend(SSEMath::widen_low_shifted(d), SSEMath::words(SSEMath::shuffle<0, 0, 1, 1>(g)));
+    const Word8 high = blend(SSEMath::widen_high_shifted(d), SSEMath::words(SSEMath::shuffle<2, 2, 3, 3>(g)));
+    // A hole comes out of this as it was.
+    return SSEMath::narrow(low, high) & (holes(g) | SSEMath::splat(0xFFFFFFu));
   }
+  // The high halves of products whose one factor has been shifted up by 8.
   VELMARK5_LANE Word8 blend(Word8 d, Word8 g) const {
-    return SSEMath::shift_right<8>(d * (SSEMath::splat_word(256) - g)) + SSEMath::shift_right<8>(colour * g);
+    return SSEMath::mulhi(d, SSEMath::splat_word(256) - g) + SSEMath::mulhi(colour, g);
   }
   Word8 colour;
 };
@@ -81,7 +82,7 @@ struct palette_ink {
   VELMARK5_LANE Int4 operator()(Int4 d, std::uint32_t bytes) const {
     const auto word = [&](int i) { return static_cast<int>(palette[bytes >> (8 * i) & 0xFF]); };
     const Int4 colours{_mm_setr_epi32(word(0), word(1), word(2), word(3))};
-    return SSEMath::select(holes(byte_lanes(bytes)), d, colours);
+    return SSEMath::select(holes(byte_pairs(bytes)), d, colours);
   }
   const unsigned int* palette;
 };
@@ -90,42 +91,60 @@ struct palette_ink {
 
 // Upright: the bytes of a screen row stand side by side.
 struct upright_rows {
-  explicit upright_rows(const bitmap& b) : bytes(b.bytes), stride(b.width) {}
-  const unsigned char* row(int j) const { return bytes + static_cast<std::ptrdiff_t>(j) * stride; }
-  VELMARK5_LANE std::uint32_t four(const unsigned char* row, int i) const {
+  explicit upright_rows(const bitmap& b) : bytes(b.bytes), step(b.width) {}
+  const unsigned char* row(std::ptrdiff_t j) const { return bytes + j * step; }
+  VELMARK5_LANE std::uint32_t four(const unsigned char* row, std::ptrdiff_t i) const {
     std::uint32_t word;
     std::memcpy(&word, row + i, 4);
     return word;
   }
-  VELMARK5_LANE std::uint32_t one(const unsigned char* row, int i) const { return row[i]; }
+  VELMARK5_LANE std::uint32_t one(const unsigned char* row, std::ptrdiff_t i) const { return row[i]; }
   const unsigned char* bytes;
-  std::ptrdiff_t stride;
+  std::ptrdiff_t step;  // from row to row
 };
 
 // A quarter turn counter-clockwise: right on the screen is down in the glyph, each lower screen row is one glyph column
 // further to the left.
 struct upward_rows {
   explicit upward_rows(const bitmap& b) : bytes(b.bytes), stride(b.width) {}
-  const unsigned char* row(int j) const { return bytes + (stride - 1 - j); }
-  VELMARK5_LANE std::uint32_t four(const unsigned char* row, int i) const {
+  const unsigned char* row(std::ptrdiff_t j) const { return bytes + (stride - 1 - j); }
+  VELMARK5_LANE std::uint32_t four(const unsigned char* row, std::ptrdiff_t i) const {
     return one(row, i) | one(row, i + 1) << 8 | one(row, i + 2) << 16 | one(row, i + 3) << 24;
   }
-  VELMARK5_LANE std::uint32_t one(const unsigned char* row, int i) const { return row[i * stride]; }
+  VELMARK5_LANE std::uint32_t one(const unsigned char* row, std::ptrdiff_t i) const { return row[i * stride]; }
   const unsigned char* bytes;
   std::ptrdiff_t stride;
+  static constexpr std::ptrdiff_t step = -1;  // from row to row
 };
 
 // --- Drawing ---------------------------------------------------------------------------------------------------------
 
-// Columns `from` up to `to` of a row of the box; target is the pixel of column `from`.
+// Four pixels, of which many are holes: much of a letter's box is empty.
+template <class Ink>
+VELMARK5_LANE void draw_four(unsigned int* target, const Ink& ink, std::uint32_t bytes) {
+  if (bytes != 0) SSEMath::store_unaligned(target, ink(SSEMath::load_unaligned(target), bytes));
+}
+
+// Columns `from` up to `to` of a row of the box; target is the pixel of column 0.
 template <class Ink, class Rows>
-VELMARK5_LANE void draw_row(unsigned int* target, const Ink& ink, const Rows& rows, int row, int from, int to) {
-  const unsigned char* bytes = rows.row(row);
-  for (; from + 4 <= to; from += 4, target += 4) {
-    SSEMath::store_unaligned(target, ink(SSEMath::load_unaligned(target), rows.four(bytes, from)));
+VELMARK5_LANE void draw_row(unsigned int* target, const Ink& ink, const Rows& rows, const unsigned char* bytes,
+                            int from, int to) {
+  std::ptrdiff_t i = from;
+  for (; i + 4 <= to; i += 4) draw_four(target + i, ink, rows.four(bytes, i));
+  for (; i < to; ++i) {
+    SSEMath::store_one(target + i, ink(SSEMath::load_one(target + i), rows.one(bytes, i)));
   }
-  for (; from < to; ++from, ++target) {
-    SSEMath::store_one(target, ink(SSEMath::load_one(target), rows.one(bytes, from)));
+}
+
+// Rows of a whole number of groups of four, few enough to be written out.
+template <int Groups, class Ink, class Rows>
+VELMARK5_LANE void draw_groups(unsigned int* target, std::ptrdiff_t pitch, const Ink& ink, const Rows& rows,
+                               const unsigned char* bytes, int from, int count) {
+  target += from;
+  for (; count > 0; --count, target += pitch, bytes += rows.step) {
+    draw_four(target, ink, rows.four(bytes, from));
+    if constexpr (Groups > 1) draw_four(target + 4, ink, rows.four(bytes, from + 4));
+    if constexpr (Groups > 2) draw_four(target + 8, ink, rows.four(bytes, from + 8));
   }
 }
 
@@ -145,26 +164,50 @@ struct visible_part {
   }
 };
 
-// Draws a box of w by h at (x, y), its pixels taken from `rows`, on the toolkit's target. With a mask only the mask's
-// spans are drawn.
+// The target's pixel at (x, y); only arithmetic, the place may lie outside.
+inline unsigned int* pixel(const toolkit& t, long long x, long long y) {
+  return t.colourbuffer + static_cast<std::ptrdiff_t>(y * t.width + x);
+}
+
+// Draws a box of w by h at (x, y), its pixels taken from `rows`, on the toolkit's target.
 template <class Ink, class Rows>
-void draw(const toolkit& t, long long x, long long y, int w, int h, const Ink& ink, const Rows& rows,
-          const clippingmask* mask = nullptr, int mask_x = 0, int mask_y = 0) {
+void draw(const toolkit& t, long long x, long long y, int w, int h, const Ink& ink, const Rows& rows) {
   const visible_part part(t, x, y, w, h);
   if (part.empty()) return;
-  for (int row = part.top; row < part.bottom; ++row) {
-    int from = part.left;
-    int to = part.right;
-    if (mask != nullptr) {
-      const long long mask_row = y + row - mask_y;
-      if (mask_row < 0 || mask_row >= mask->rows()) continue;
-      const long long start = static_cast<long long>(mask_x) + mask->starts[static_cast<int>(mask_row)] - x;
-      const long long end = start + mask->lengths[static_cast<int>(mask_row)];
-      from = static_cast<int>(std::clamp<long long>(start, from, to));
-      to = static_cast<int>(std::clamp<long long>(end, from, to));
-    }
-    const auto index = static_cast<std::ptrdiff_t>((y + row) * t.width + x + from);
-    draw_row(t.colourbuffer + index, ink, rows, row, from, to);
+  // The pixel of column 0, though it need not lie in the target.
+  const std::ptrdiff_t pitch = t.width;
+  unsigned int* target = pixel(t, x, y + part.top);
+  const unsigned char* bytes = rows.row(part.top);
+  const int count = part.bottom - part.top;
+  switch (part.right - part.left) {
+    case 8:
+      return draw_groups<2>(target, pitch, ink, rows, bytes, part.left, count);
+    case 12:
+      return draw_groups<3>(target, pitch, ink, rows, bytes, part.left, count);
+  }
+  for (int i = 0; i < count; ++i, target += pitch, bytes += rows.step) {
+    draw_row(target, ink, rows, bytes, part.left, part.right);
+  }
+}
+
+// The same within the spans of a mask at (mask_x, mask_y).
+template <class Ink, class Rows>
+void draw_masked(const toolkit& t, long long x, long long y, int w, int h, const Ink& ink, const Rows& rows,
+                 const clippingmask& mask, int mask_x, int mask_y) {
+  const visible_part part(t, x, y, w, h);
+  if (part.empty()) return;
+  // The mask's rows, and where its columns begin, counted in the box.
+  const long long first = std::max<long long>(part.top, mask_y - y);
+  const long long end = std::min<long long>(part.bottom, mask_y - y + mask.rows());
+  const long long column = mask_x - x;
+  const int* const starts = mask.starts.data();
+  const int* const lengths = mask.lengths.data();
+  for (long long row = first; row < end; ++row) {
+    const long long mask_row = row - (mask_y - y);
+    const long long start = column + starts[mask_row];
+    const auto from = static_cast<int>(std::clamp<long long>(start, part.left, part.right));
+    const auto to = static_cast<int>(std::clamp<long long>(start + lengths[mask_row], from, part.right));
+    draw_row(pixel(t, x, y + row), ink, rows, rows.row(row), from, to);
   }
 }
 
