@@ -27,6 +27,7 @@ public final class Demo {
   private static final double FRAMES_PER_SECOND = 60;
 
   private final Options options;
+  private final Pilot pilot = new Pilot();
   private volatile boolean running = true;
   private int drawn;
 
@@ -90,6 +91,7 @@ public final class Demo {
         });
     window.pack();
     window.setVisible(true);
+    pilot.attach(component);
     try (Toolkit toolkit = Toolkit.create(new Textures(), Textures.COUNT)) {
       // The window's place on the screen may be smaller than what was asked for.
       Canvas canvas = toolkit.createCanvas(component, Math.max(1, component.getWidth()), Math.max(1, component.getHeight()));
@@ -102,6 +104,11 @@ public final class Demo {
             canvas.resize(width, height);
           }
           return new Rect(0, 0, width, height);
+        }
+
+        @Override
+        boolean steered() {
+          return options.frames() == 0;
         }
 
         @Override
@@ -147,30 +154,45 @@ public final class Demo {
   /** The loop, for whatever the frames are shown in. */
   private abstract class Show {
     private final Toolkit toolkit;
-    private final Hud hud;
+    private final Daylight day = new Daylight();
     private final List<Scene> scenes;
     private Rect laidOut = new Rect(0, 0, 0, 0);
 
     Show(Toolkit toolkit) {
       this.toolkit = toolkit;
+      scenes = options.scene().equals("lake") ? lake() : village();
+    }
+
+    private List<Scene> lake() {
       MemoryPool pool = toolkit.createPool(1 << 20);
       Spectrum spectrum = new Spectrum(toolkit);
       Knot knot = new Knot(toolkit);
       Radar radar = new Radar(toolkit, pool);
-      hud = new Hud(toolkit, pool, spectrum, radar);
-      scenes =
-          List.of(
-              new Sky(toolkit),
-              new Hills(toolkit),
-              new Stones(toolkit, pool, knot, false),
-              knot,
-              new Stones(toolkit, pool, knot, true),
-              new Lanterns(toolkit),
-              new Lake(toolkit),
-              spectrum,
-              radar,
-              new Compass(toolkit),
-              hud);
+      return List.of(
+          new Sky(toolkit),
+          new Hills(toolkit),
+          new Stones(toolkit, pool, knot, false),
+          knot,
+          new Stones(toolkit, pool, knot, true),
+          new Lanterns(toolkit),
+          new Lake(toolkit),
+          spectrum,
+          radar,
+          new Compass(toolkit),
+          new Hud(toolkit, pool, spectrum, radar));
+    }
+
+    private List<Scene> village() {
+      MemoryPool pool = toolkit.createPool(16 << 20);
+      return List.of(
+          new Firmament(toolkit, pilot, day),
+          new Village(toolkit, pool, pilot, day),
+          new Overlay(toolkit, pool, pilot, day, steered()));
+    }
+
+    /** Whether somebody can steer. */
+    boolean steered() {
+      return false;
     }
 
     /** Adapts the frame to what it is shown in, and returns its size. */
@@ -190,7 +212,7 @@ public final class Demo {
         // Decided before the frame is drawn, so that the last one fits the window as it was left.
         boolean last = !running || drawn + 1 == options.frames();
         // A counted run is the same in every run; else the clock leads.
-        double seconds = options.frames() > 0 ? drawn / FRAMES_PER_SECOND : (began - start) / 1e9;
+        double seconds = options.start() + (options.frames() > 0 ? drawn / FRAMES_PER_SECOND : (began - start) / 1e9);
         draw(seconds);
         drawn++;
         // A present may exchange images, so the last frame is taken before it.
@@ -206,7 +228,7 @@ public final class Demo {
               console.milliseconds());
         }
         if (shown.count(began, done, last)) {
-          hud.showRate(shown.framesPerSecond(), shown.milliseconds());
+          scenes.forEach(scene -> scene.showRate(shown.framesPerSecond(), shown.milliseconds()));
         }
         if (picture != null) {
           save(picture);
@@ -227,6 +249,8 @@ public final class Demo {
         laidOut = size;
       }
       toolkit.advance((int) ((long) (seconds * 1000) & Integer.MAX_VALUE));
+      day.set(seconds);
+      pilot.move(seconds);
       scenes.forEach(scene -> scene.prepare(seconds));
       select();
       scenes.forEach(scene -> scene.paint(seconds));

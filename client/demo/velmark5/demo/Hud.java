@@ -33,7 +33,8 @@ final class Hud implements Scene {
     this.radar = radar;
   }
 
-  void showRate(double framesPerSecond, double milliseconds) {
+  @Override
+  public void showRate(double framesPerSecond, double milliseconds) {
     rate = String.format(Locale.ROOT, "%.0f frames/s   %.1f ms", framesPerSecond, milliseconds);
   }
 

@@ -10,4 +10,7 @@ interface Scene {
 
   /** Draws the scene into the frame. */
   void paint(double seconds);
+
+  /** Tells how fast the program is. */
+  default void showRate(double framesPerSecond, double milliseconds) {}
 }
