@@ -85,10 +85,11 @@ class face_drawer {
                      FogMode_e::None, BlendMode_e::Opaque, false, false, true, false, true>(triangle);
     } else {
       if (HEIGHTFOG && !fog_corners(a, b, c)) return;
-      face_colours colours = mesh.fcolours[f];
+      const auto& corners = mesh.fcolours[f].corner;
+      alignas(16) unsigned int words[4] = {corners[0], corners[1], corners[2], 0};
       const cachedtexture* const texture = texture_of(f);
-      if (texture == nullptr || texture->lighting_kind != unlit_material) light_face(f, type, a, b, c, colours);
-      for (int k = 0; k < 3; ++k) expand(colours.corner[k], triangle.colour[k]);
+      if (texture == nullptr || texture->lighting_kind != unlit_material) light_face(f, type, a, b, c, words);
+      for (int k = 0; k < 3; ++k) expand(words[k], triangle.colour[k]);
       triangle.alpha = (255u - transparency) * 0x10001u;
       if (texture == nullptr || texture->texels == nullptr) {
         draw_untextured(transparency != 0);
@@ -115,27 +116,27 @@ class face_drawer {
     return f.x != 1.0f && f.y != 1.0f && f.z != 1.0f;
   }
 
-  void light_face(int f, unsigned char type, int a, int b, int c, face_colours& colours) {
-    const int corner[3] = {a, b, c};
-    if (type == FT_SMOOTH) {
-      for (int k = 0; k < 3; ++k) {
-        const int v = corner[k];
-        const bool shared = mesh.vsharednormal.address != nullptr && mesh.vsharednormal[v].w != 0.0f;
-        const Vector4_s& normal = shared ? mesh.vsharednormal[v] : mesh.vnormal[v];
-        const int intensity = lighting::sun_intensity(scene, normal, smooth_factor);
-        colours.corner[k] = lit(colours.corner[k], intensity, v, normal);
-      }
-    } else if (type == FT_FLAT) {
-      const Vector4_s& normal = mesh.fnormal[f];
-      const int intensity = lighting::sun_intensity(scene, normal, flat_factor);
-      for (int k = 0; k < 3; ++k) colours.corner[k] = lit(colours.corner[k], intensity, corner[k], normal);
-    }
+  // The normal that a smooth face has at a vertex.
+  const Vector4_s& vertex_normal(int v) const {
+    const bool shared = mesh.vsharednormal.address != nullptr && mesh.vsharednormal[v].w != 0.0f;
+    return shared ? mesh.vsharednormal[v] : mesh.vnormal[v];
   }
 
-  unsigned int lit(unsigned int rgb, int intensity, int vertex, const Vector4_s& normal) const {
-    const unsigned int sunlit = lighting::sunlit(scene, rgb, 255, intensity);
-    if constexpr (!POINTLIT) return sunlit;
-    return lighting::pointlit(scene, mesh.lightpos, sunlit, mesh.vpos[vertex], normal);
+  // Lights the words of the three corners.
+  VELMARK5_LANE void light_face(int f, unsigned char type, int a, int b, int c, unsigned int* words) {
+    if (type > FT_FLAT) return;
+    const bool smooth = type == FT_SMOOTH;
+    const Vector4_s& na = smooth ? vertex_normal(a) : mesh.fnormal[f];
+    const Vector4_s& nb = smooth ? vertex_normal(b) : na;
+    const Vector4_s& nc = smooth ? vertex_normal(c) : na;
+    const float contrast_factor = smooth ? smooth_factor : flat_factor;
+    const SSEMath::Int4 intensities = lighting::sun_intensities(scene, na, nb, nc, contrast_factor);
+    SSEMath::store(words, lighting::sunlit_corners(scene, SSEMath::load(words), intensities));
+    if constexpr (POINTLIT) {
+      words[0] = lighting::pointlit(scene, mesh.lightpos, words[0], mesh.vpos[a], na);
+      words[1] = lighting::pointlit(scene, mesh.lightpos, words[1], mesh.vpos[b], nb);
+      words[2] = lighting::pointlit(scene, mesh.lightpos, words[2], mesh.vpos[c], nc);
+    }
   }
 
   // Bytes to channels times 256.
