@@ -75,9 +75,11 @@ class face_drawer {
     const int a = mesh.fa[f], b = mesh.fb[f], c = mesh.fc[f];
     const int flags = resource.vertex_flags[a] & resource.vertex_flags[b] & resource.vertex_flags[c];
     if (flags != Rasterizer_n::CullFlagsVisible) return;
-    triangle.vertex[0] = resource.vertices[a];
-    triangle.vertex[1] = resource.vertices[b];
-    triangle.vertex[2] = resource.vertices[c];
+    // Whole registers: the triangle stage loads them whole, and would wait for parts.
+    const auto copy = [](Vector4_s& out, const Vector4_s& in) { SSEMath::store(&out.x, SSEMath::load(&in.x)); };
+    copy(triangle.vertex[0], resource.vertices[a]);
+    copy(triangle.vertex[1], resource.vertices[b]);
+    copy(triangle.vertex[2], resource.vertices[c]);
     if (!Rasterizer_n::FacesViewer(triangle.vertex[0], triangle.vertex[1], triangle.vertex[2])) return;
     using namespace Rasterizer_n;
     if constexpr (!COLOUR) {
@@ -147,8 +149,9 @@ class face_drawer {
 
   // Each corner has a base of its own in the record.
   void place_texture(int f, const cachedtexture& texture) {
-    const auto row = [](Vector4_s& out, float u, float v, texture_coordinates t) {
-      out = {u + t.u, v + t.v, u + t.u, v + t.v};
+    const auto row = [](Vector4_s& out, float u, float v, const texture_coordinates& t) {
+      const SSEMath::Float4 own{_mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(&t)))};
+      SSEMath::store(&out.x, SSEMath::floats(u, v, u, v) + SSEMath::shuffle<0, 1, 0, 1>(own));
     };
     row(triangle.texcoord[0], texture.offset_u.z, texture.offset_v.z, mesh.fuv0[f]);
     row(triangle.texcoord[1], texture.offset_u.y, texture.offset_v.y, mesh.fuv1[f]);
