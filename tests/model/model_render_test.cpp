@@ -73,12 +73,12 @@ struct difference {
 
 }  // namespace
 
-// A sum of floats in another order moves a vertex, a texture coordinate or a light by its last bit. That may choose
-// another pixel at an edge, another texel, or another step of the processor's estimates: few pixels of few frames.
+// Bit for bit: the reference adds its floats in the library's order and asks the same processor for its estimates. A
+// library that adds in another order moves an edge by a pixel or a colour by a step, and this test will say so.
 TEST_F(ModelRenderTest, AllVariantsDrawTheReferencesFrames) {
   test_random r(3);
   std::set<int> drawn, seen;
-  int frames = 0, equal = 0, culled = 0;
+  int culled = 0;
   std::uint64_t hash = 0;
   for (int n = 0; n < 700; ++n) {
     SCOPED_TRACE(n);
@@ -125,16 +125,14 @@ TEST_F(ModelRenderTest, AllVariantsDrawTheReferencesFrames) {
       ASSERT_EQ(model::modelcount - drawn_before, variant >= 0);
       EXPECT_EQ(m.hasalpha, o.hasalpha);
       EXPECT_TRUE(result == nullptr || java.ints(result) == expected_result);
-      ++frames;
       difference d;
       d.of(colour.copy(), slow_colour.copy());
       for (std::size_t i = 0; i < depth.elements(); ++i) {
         const bool same = std::bit_cast<int>(depth.data()[i]) == std::bit_cast<int>(slow_depth.data()[i]);
         if (!same) ++d.depths;
       }
-      equal += d.pixels == 0 && d.depths == 0;
-      EXPECT_LE(d.pixels, width * height / 50) << "most " << d.most << " variant " << variant;
-      EXPECT_LE(d.depths, width * height / 50) << " variant " << variant;
+      EXPECT_EQ(d.pixels, 0) << "most " << d.most << " variant " << variant;
+      EXPECT_EQ(d.depths, 0) << " variant " << variant;
       if (variant < 0) {
         ++culled;
       } else {
@@ -147,8 +145,6 @@ TEST_F(ModelRenderTest, AllVariantsDrawTheReferencesFrames) {
     }
     Java_h_ma(env, object);
   }
-  std::printf("%d of %d frames equal bit for bit, %d models culled\n", equal, frames, culled);
-  EXPECT_GT(equal, frames * 99 / 100);
   EXPECT_GT(culled, 50);
   // 16 with a colour target, and 8 of the depth alone: all of them left something in some frame.
   EXPECT_EQ(drawn.size(), 24u);
