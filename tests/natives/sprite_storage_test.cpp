@@ -1,7 +1,9 @@
 // Making sprites, filling them, and asking for their sizes.
+#include <cerrno>
 #include <climits>
 
 #include "raster/Sprite.h"
+#include "support/allocation_failure.h"
 #include "support/random.h"
 #include "support/toolkit_fixture.h"
 
@@ -201,6 +203,14 @@ TEST_F(sprite_storage, failed_creations_bind_nothing) {
   java.fail_array_access(1);
   Java_fa_RA(env, peer_of_sprite, 0, pixels, 0, 4, 4, 3, 0);
   expect_no_sprite("java.lang.OutOfMemoryError");
+  const auto without_memory = [&](auto&& create) {
+    allocation_failure::fail_memalign(1, ENOMEM);
+    create();
+    expect_no_sprite("java.lang.RuntimeException: Cannot allocate memory");
+  };
+  without_memory([&] { Java_fa_UA(env, peer_of_sprite, 0, 4, 3); });
+  without_memory([&] { Java_fa_RA(env, peer_of_sprite, 0, pixels, 0, 4, 4, 3, 0); });
+  without_memory([&] { Java_fa_EA(env, peer_of_sprite, 0, pixels, bytes, nullptr, 0, 4, 4, 3); });
   Java_fa_K(env, peer_of_sprite, 0, 0, 0, -1, -1, 0);
   expect_no_sprite("java.lang.Exception: No colour buffer");  // looked at first
   make_target(8, 8);

@@ -46,6 +46,23 @@ TEST_F(sprite_render, scaled_equals_the_reference) {
   });
 }
 
+// Every pair of widths: the steps in float, and the division at the end of a row, each by its own rounding.
+TEST_F(sprite_render, every_scale_equals_the_reference) {
+  test_random random(9);
+  for (int width = 1; width <= 48; ++width) {
+    random_sprite(random, width, 1, false);
+    random_target(random, 150, 1, false);
+    for (int to = 1; to <= 150; ++to) {
+      kit().setclipping(to % 5, 0, 150 - to % 3, 1);
+      expected.clip_x0 = kit().clip_x0;
+      expected.clip_x1 = kit().clip_x1;
+      Java_fa_ha(env, nullptr, handle(), 0, 0, to, 1, 1, 0, 0);
+      sprite_oracle::draw_scaled(expected, image, {1, 0, 0}, 0, 0, to, 1);
+      ASSERT_TRUE(same()) << width << " to " << to;
+    }
+  }
+}
+
 // Wide targets are drawn in strips; columns must go on across them. Large images show where the steps' rounding goes.
 TEST_F(sprite_render, wide_scaled_sprites_equal_the_reference) {
   for (int call = 0; call < 40; ++call) {

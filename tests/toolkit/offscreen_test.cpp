@@ -1,9 +1,11 @@
 // Images as targets, and copies between them and the current target.
+#include <cerrno>
 #include <climits>
 #include <cstring>
 
 #include "raster/DepthBuffer.h"
 #include "raster/Sprite.h"
+#include "support/allocation_failure.h"
 #include "support/random.h"
 #include "support/toolkit_fixture.h"
 
@@ -97,6 +99,10 @@ TEST_F(offscreen, depth_images) {
     EXPECT_EQ(java.take_exception().rfind("java.lang.IllegalArgumentException: ", 0), 0u);
     EXPECT_EQ(depth_handle(), 0);
   }
+  allocation_failure::fail_memalign(1, ENOMEM);
+  Java_oa_g(env, depth_peer, 3, 3);
+  EXPECT_EQ(java.take_exception(), "java.lang.RuntimeException: Cannot allocate memory");
+  EXPECT_EQ(depth_handle(), 0);
 }
 
 // Bit copies both ways, of any mixture of buffers; only the value 1 chooses one.
