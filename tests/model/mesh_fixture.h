@@ -79,7 +79,8 @@ class mesh_fixture : public toolkit_fixture {
     list(m.fpriority, n, 2, range(-128, 127));
     list(m.falpha, n, 2, [&] { return r.one_in(8) ? 255 : r.one_in(2) ? 0 : r.between(1, 254); });
     list(m.fhsl, n, 1, range(-32768, 32767));
-    if (!r.one_in(5)) list(m.ftex, n, 1, [&] { return r.one_in(4) ? -1 : r.between(0, textures - 1); });
+    const int first_texture = r.one_in(3) ? textures - 3 : 0;  // the last three do not seem to blend
+    if (!r.one_in(5)) list(m.ftex, n, 1, [&] { return r.one_in(4) ? -1 : r.between(first_texture, textures - 1); });
     list(m.fmask, n, 2, range(-32768, 32767));
     m.priority = static_cast<std::int8_t>(r.between(-128, 127));
 
