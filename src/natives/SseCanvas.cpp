@@ -2,7 +2,6 @@
 #include <memory>
 
 #include "natives/native.h"
-#include "raster/Rasterizer.h"
 #include "toolkit/canvas.h"
 #include "toolkit/display_binding.h"
 
@@ -55,17 +54,14 @@ const display_binding& check_new_surface(JNIEnv* env, jobject component, int wid
 
 canvas& canvas_of(JNIEnv* env, jobject peer) { return contract::object(objconvert::get_canvas(env, peer)); }
 
-// Drawing after the buffers are gone and before another target is active must not write to where they were.
-void forget_target(const canvas& gone) {
-  if (!contract::checked || toolkit::m_pInstance == nullptr) return;
-  toolkit& instance = *toolkit::m_pInstance;
-  if (gone.colourbuffer != nullptr) {
-    if (instance.colourbuffer == gone.colourbuffer) instance.colourbuffer = nullptr;
-    if (Rasterizer_n::m_pColourBuffer == gone.colourbuffer) Rasterizer_n::m_pColourBuffer = nullptr;
-  }
-  if (gone.depthbuffer != nullptr) {
-    if (instance.depthbuffer == gone.depthbuffer) instance.depthbuffer = nullptr;
-    if (Rasterizer_n::m_pDepthBuffer == gone.depthbuffer) Rasterizer_n::m_pDepthBuffer = nullptr;
+// A flip makes the canvas's other image the target, whatever the target was: one that described more pixels would be
+// drawn past the image's end.
+void target_fits(const canvas& c) {
+  const toolkit& scene = current_toolkit();
+  if (!contract::checked || !c.use_shm || scene.colourbuffer == nullptr) return;
+  if (static_cast<long long>(scene.width) * scene.height > static_cast<long long>(c.width) * c.height) {
+    contract::fail_state("canvas: %dx%d cannot become the target of %dx%d", c.width, c.height, scene.width,
+                         scene.height);
   }
 }
 
@@ -82,7 +78,7 @@ VELMARK5_NATIVE(void) Java_za_n(JNIEnv* env, jobject peer, jint, jobject compone
 VELMARK5_NATIVE(void) Java_za_ma(JNIEnv* env, jobject peer) {
   frame(env, [&] {
     if (canvas* old = objconvert::get_canvas(env, peer)) {
-      forget_target(*old);
+      forget_target(old->colourbuffer, old->depthbuffer);
       delete old;
     }
     objconvert::set_canvas(env, peer, nullptr);
@@ -93,7 +89,7 @@ VELMARK5_NATIVE(void) Java_za_wa(JNIEnv* env, jobject peer, jobject component, j
   frame(env, [&] {
     canvas& c = canvas_of(env, peer);
     check_new_surface(env, component, width, height);
-    forget_target(c);
+    forget_target(c.colourbuffer, c.depthbuffer);
     c.resized(component, width, height);
   });
 }
@@ -106,6 +102,7 @@ VELMARK5_NATIVE(void) Java_za_H(JNIEnv* env, jobject peer, jint x, jint y, jint 
     contract::not_negative("width", width);
     contract::not_negative("height", height);
     contract::rectangle_inside("rectangle", x, y, width, height, c.width, c.height);
+    target_fits(c);
     c.flip(x, y, width, height);
   });
 }

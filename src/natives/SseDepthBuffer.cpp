@@ -16,7 +16,13 @@ VELMARK5_NATIVE(void) Java_oa_g(JNIEnv* env, jobject peer, jint width, jint heig
 
 VELMARK5_NATIVE(void) Java_oa_za(JNIEnv* env, jobject peer, jlong handle) {
   frame(env, [&] {
-    delete from_optional_handle<DepthBuffer_c>(handle);
+    const auto* const image = from_optional_handle<DepthBuffer_c>(handle);
+    if (image != nullptr) {
+      forget_target(nullptr, image->depth);
+      if (toolkit* t = toolkit::live_instance; t != nullptr && t->offscreen_depth == image)
+        t->offscreen_depth = nullptr;
+      delete image;
+    }
     objconvert::set_depthbuffer(env, peer, nullptr);
   });
 }

@@ -11,11 +11,12 @@ Java_ia_EA(JNIEnv* env, jobject peer, jint, jobject pool, jobjectArray glyphs, j
     memorymanager& memory = contract::object(objconvert::get_memorypool(env, pool));
     contract::not_null(glyphs);
     const font_natives::arguments from{glyphs, widths, heights, y_offsets, x_offsets};
-    font_natives::check(env, from, palette != nullptr ? array_length(env, palette) : font_natives::no_palette);
+    const int palette_length = palette != nullptr ? array_length(env, palette) : font_natives::no_palette;
+    font_natives::check(env, from, palette_length);
     auto font = std::make_unique<font_paletted>(&memory);
     font->palette = copied_jintArrayRO(env, palette).toSharedarray<unsigned int>(&memory);
     font_natives::load_metrics(env, &memory, from, font->metrics);
-    font_natives::load_glyphs(env, &memory, glyphs, font->glyphs);
+    font_natives::load_glyphs(env, &memory, glyphs, palette_length, font->glyphs);
     objconvert::set_font_paletted(env, peer, font.release());
   });
 }

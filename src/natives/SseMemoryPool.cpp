@@ -4,6 +4,15 @@
 
 using namespace natives;
 
+namespace {
+
+// The callback that asks for memory runs inside an allocation, whose pool must outlive it.
+void not_allocating(const memorymanager& pool) {
+  if (contract::checked && pool.is_allocating()) contract::fail_state("pool: it is in the middle of an allocation");
+}
+
+}  // namespace
+
 VELMARK5_NATIVE(void) Java_ba_sa(JNIEnv* env, jobject peer, jint, jint size) {
   frame(env, [&] {
     toolkit& owner = current_toolkit();
@@ -17,6 +26,7 @@ VELMARK5_NATIVE(void) Java_ba_ma(JNIEnv* env, jobject peer) {
   frame(env, [&] {
     // Only the storage goes: the weak reference to the peer stays until the process ends.
     if (memorymanager* pool = objconvert::get_memorypool(env, peer); pool != nullptr) {
+      not_allocating(*pool);
       pool->~memorymanager();
       ::operator delete(pool);
     }
@@ -26,7 +36,9 @@ VELMARK5_NATIVE(void) Java_ba_ma(JNIEnv* env, jobject peer) {
 
 VELMARK5_NATIVE(void) Java_ba_ha(JNIEnv* env, jobject peer) {
   frame(env, [&] {
-    contract::object(objconvert::get_memorypool(env, peer)).release_resources();
+    memorymanager& pool = contract::object(objconvert::get_memorypool(env, peer));
+    not_allocating(pool);
+    pool.release_resources();
     objconvert::set_memorypool(env, peer, nullptr);
   });
 }

@@ -103,7 +103,13 @@ Java_fa_EA(JNIEnv* env, jobject peer, jint, jintArray palette, jbyteArray indice
 
 VELMARK5_NATIVE(void) Java_fa_M(JNIEnv* env, jobject peer, jlong handle) {
   frame(env, [&] {
-    delete from_optional_handle<Sprite_c>(handle);
+    const auto* const sprite = from_optional_handle<Sprite_c>(handle);
+    if (sprite != nullptr) {
+      forget_target(sprite->pixels, nullptr);
+      if (toolkit* t = toolkit::live_instance; t != nullptr && t->offscreen_sprite == sprite)
+        t->offscreen_sprite = nullptr;
+      delete sprite;
+    }
     objconvert::set_sprite(env, peer, nullptr);
   });
 }

@@ -12,7 +12,10 @@ using namespace natives;
 
 VELMARK5_NATIVE(void) Java_ja_q(JNIEnv* env, jobject peer, jobject texture_source, jint texture_count) {
   frame(env, [&] {
-    if (texture_source != nullptr) contract::not_negative("texture_count", texture_count);
+    if (texture_source != nullptr) {
+      contract::not_negative("texture_count", texture_count);
+      contract::at_most("texture_count", texture_count, 65536);  // ids have 16 bits
+    }
     void* place = _aligned_malloc(sizeof(toolkit), 16);
     toolkit* instance = nullptr;
     try {

@@ -73,9 +73,14 @@ void rows_inside(const char* name, int length, int offset, int stride, int w, in
   }
 }
 
+constexpr int longest_side = 1 << 20;
+
 void image_size(int width, int height) {
   not_negative("width", width);
   not_negative("height", height);
+  // An image without area has no pixels to limit its sides.
+  at_most("width", width, longest_side);
+  at_most("height", height, longest_side);
   constexpr long long most = std::numeric_limits<int>::max() / 4;
   if (checked && static_cast<long long>(width) * height > most) {
     fail_argument("size: %dx%d is more than %lld pixels", width, height, most);

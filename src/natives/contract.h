@@ -30,6 +30,10 @@ inline void not_negative(const char* name, int value) {
   if (checked && value < 0) fail_argument("%s: %d is negative", name, value);
 }
 
+inline void at_most(const char* name, int value, int most) {
+  if (checked && value > most) fail_argument("%s: %d is more than %d", name, value, most);
+}
+
 inline void at_least(const char* name, int value, int least) {
   if (checked && value < least) fail_argument("%s: %d is less than %d", name, value, least);
 }

@@ -23,6 +23,14 @@ class local_reference {
   jobject object;
 };
 
+void check_indices(int glyph, const unsigned char* bytes, int length, int palette_length) {
+  if (!contract::checked || palette_length >= no_palette || length == 0) return;
+  const int largest = *std::max_element(bytes, bytes + length);
+  if (largest >= palette_length && largest > 0) {
+    contract::fail_array("palette: length %d, but glyphs[%d] uses index %d", palette_length, glyph, largest);
+  }
+}
+
 }  // namespace
 
 void check(JNIEnv* env, const arguments& from, int palette_length) {
@@ -39,12 +47,7 @@ void check(JNIEnv* env, const arguments& from, int palette_length) {
       const auto needed = static_cast<long long>(widths.elements[i]) * heights.elements[i];
       if (length < needed) contract::fail_array("glyphs[%d]: length %d, %lld needed", i, length, needed);
     }
-    if (palette_length >= no_palette || length == 0) continue;
-    const auto* first = reinterpret_cast<const unsigned char*>(bytes.elements);
-    const int largest = *std::max_element(first, first + length);
-    if (largest >= palette_length && largest > 0) {
-      contract::fail_array("palette: length %d, but glyphs[%d] uses index %d", palette_length, i, largest);
-    }
+    check_indices(i, reinterpret_cast<const unsigned char*>(bytes.elements), length, palette_length);
   }
 }
 
@@ -59,7 +62,7 @@ void load_metrics(JNIEnv* env, memorymanager* pool, const arguments& from, font_
   metrics.x_offsets = x_offsets.toSharedarray<int>(pool);
 }
 
-void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, glyph_bitmaps& glyphs) {
+void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, int palette_length, glyph_bitmaps& glyphs) {
   glyph_bitmaps loaded(env->GetArrayLength(from));
   glyphs.swap(loaded);
   for (int i = 0; i < glyphs.count; ++i) {
@@ -69,6 +72,7 @@ void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, glyph_bitm
     const int length = bytes.length();
     glyphs[i] = sharedarray<unsigned char>::allocate(*pool, static_cast<unsigned int>(length));
     std::memcpy(glyphs[i].data(), bytes.elements, static_cast<unsigned int>(length));
+    check_indices(i, glyphs[i].data(), length, palette_length);
   }
 }
 

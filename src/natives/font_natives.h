@@ -23,8 +23,9 @@ inline constexpr int no_palette = 256;  // longer than every index
 // Copies the metrics into the pool, in the order widths, heights, y_offsets, x_offsets.
 void load_metrics(JNIEnv* env, memorymanager* pool, const arguments& from, font_metrics& metrics);
 
-// Copies the bitmaps into the pool; a null element stays an empty handle.
-void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, glyph_bitmaps& glyphs);
+// Copies the bitmaps into the pool; a null element stays an empty handle. Indices that a palette of palette_length
+// words lacks raise here too: another thread may have written to the arrays since they were checked.
+void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, int palette_length, glyph_bitmaps& glyphs);
 
 // How a font is found from its peer.
 template <class Font>
@@ -50,7 +51,7 @@ void plot_masked(JNIEnv* env, getter<Font> get, jobject peer, jchar glyph, jint 
   natives::frame(env, [&] {
     const Font& font = resolve(env, get, peer);
     font.plotletter(static_cast<short>(glyph), x, y, static_cast<unsigned int>(colour), natives::is_true(solid),
-                    objconvert::get_clippingmask(env, mask), mask_x, mask_y);
+                    &contract::object(objconvert::get_clippingmask(env, mask)), mask_x, mask_y);
   });
 }
 

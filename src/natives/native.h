@@ -78,8 +78,14 @@ T* from_optional_handle(jlong handle) {
   return reinterpret_cast<T*>(static_cast<std::intptr_t>(handle));
 }
 
-// The process's toolkit; raises before there is one.
-inline toolkit& current_toolkit() { return contract::object(toolkit::m_pInstance); }
+// The process's toolkit; raises before there is one, and after it is gone.
+inline toolkit& current_toolkit() {
+  if (contract::checked && toolkit::m_pInstance != toolkit::live_instance) contract::fail_null();
+  return contract::object(toolkit::m_pInstance);
+}
+
+// Buffers are about to be freed: what is drawn before another target is active must not go to where they were.
+void forget_target(const void* colour, const void* depth);
 
 // Only the value 1 is true.
 inline bool is_true(jboolean value) { return value == 1; }

@@ -6,6 +6,7 @@
 #include <cstdint>
 
 #include "raster/Rasterizer.h"
+#include "raster/imagememory.h"
 #include "toolkit/display_binding.h"
 #include "toolkit/toolkit.h"
 #include "util/assertion.h"
@@ -159,7 +160,7 @@ void canvas::create_backbuffer(int new_width, int new_height) {
   width = new_width;
   height = new_height;
   try {
-    depthbuffer = static_cast<float*>(_aligned_malloc(buffer_size(width, height), 64));
+    depthbuffer = static_cast<float*>(_aligned_malloc(raster::whole_groups(buffer_size(width, height)), 64));
     JNIEnv* env = get_env();
     JAWT awt = {};
     if (!get_awt(binding, env, JAWT_VERSION_1_4, awt))
@@ -234,7 +235,7 @@ bool canvas::map_shared_image(int i) {
 }
 
 void canvas::create_local_image() {
-  colourbuffer = static_cast<unsigned int*>(_aligned_malloc(buffer_size(width, height), 64));
+  colourbuffer = static_cast<unsigned int*>(_aligned_malloc(raster::whole_groups(buffer_size(width, height)), 64));
   image[0] = binding.XCreateImage(display, ScreenOfDisplay(display, 0)->root_visual, image_depth, ZPixmap, 0,
                                   reinterpret_cast<char*>(colourbuffer), width, height, 32, 0);
   if (image[0] == nullptr) {

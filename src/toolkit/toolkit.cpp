@@ -9,6 +9,7 @@
 #include "util/memorymanager/alignedmemory.h"
 
 toolkit* toolkit::m_pInstance = nullptr;
+toolkit* toolkit::live_instance = nullptr;
 
 jmethodID mid_request_texture = nullptr;
 jmethodID mid_garbagecollect = nullptr;
@@ -66,9 +67,11 @@ toolkit::toolkit(JNIEnv* env, jobject peer, jobject texture_source, int texture_
 
   // Flush-to-zero and denormals-are-zero, on this thread and those that the runtime starts from it.
   _mm_setcsr(_mm_getcsr() | 0x8040);
+  live_instance = this;
 }
 
 toolkit::~toolkit() {
+  if (live_instance == this) live_instance = nullptr;
   restore_se_handling();
   get_env()->DeleteWeakGlobalRef(java_peer);
   if (textures != nullptr) {
@@ -89,6 +92,7 @@ static void acknowledge(JNIEnv* env) { static_cast<void>(env->ExceptionCheck());
 
 bool toolkit::request_texture(unsigned short id) {
   JNIEnv* env = get_env();
+  if (env->ExceptionCheck()) return false;  // an earlier request failed: Java may not be called now
   const jboolean answer =
       env->CallBooleanMethod(java_peer, mid_request_texture, static_cast<jint>(static_cast<jshort>(id)));
   acknowledge(env);
@@ -97,6 +101,7 @@ bool toolkit::request_texture(unsigned short id) {
 
 void toolkit::garbagecollect() {
   JNIEnv* env = get_env();
+  if (env->ExceptionCheck()) return;
   env->CallVoidMethod(java_peer, mid_garbagecollect);
   acknowledge(env);
 }

@@ -34,6 +34,8 @@ class alignas(16) toolkit {
   toolkit& operator=(const toolkit&) = delete;
 
   static toolkit* m_pInstance;
+  // The toolkit that was made last, null once it is gone; m_pInstance keeps its value then.
+  static toolkit* live_instance;
 
   // --- Java -----------------------------------------------------------------------------------------------------
 

@@ -34,6 +34,18 @@ bool fits(const unsigned char* candidate, unsigned int length, const unsigned ch
   throw new OutOfMemory(text);
 }
 
+// Counts an allocation while it is under way, also when it fails.
+class allocation_mark {
+ public:
+  explicit allocation_mark(int& count) : marks(count) { ++marks; }
+  ~allocation_mark() { --marks; }
+  allocation_mark(const allocation_mark&) = delete;
+  allocation_mark& operator=(const allocation_mark&) = delete;
+
+ private:
+  int& marks;
+};
+
 }  // namespace
 
 bool memorymanager::move_at_every_allocation = false;
@@ -99,6 +111,7 @@ allocatedmemory_autopointer memorymanager::allocate(unsigned int length, unsigne
   if (length > std::numeric_limits<int>::max()) throw_growth_failed(length);
   monitor_enter();
   if (move_at_every_allocation) move_storage();
+  const allocation_mark mark(allocating);
   unsigned char* address = findspace(length, alignment, true);
   auto* block = new allocatedmemory;
   block->length = static_cast<int>(length);

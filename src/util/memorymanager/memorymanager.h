@@ -42,6 +42,9 @@ class memorymanager {
   // Frees the storage and clears every handle; the object stays, so that handles may still be destroyed.
   void release_resources();
 
+  // True while an allocation is under way, as in the collection that it may call for.
+  bool is_allocating() const { return allocating > 0; }
+
   // Bytes in use in all pools together.
   unsigned int get_size() const { return static_cast<unsigned int>(allocatedmemory::allocated_size); }
 
@@ -58,6 +61,8 @@ class memorymanager {
   linkable blocks;      // ring of allocatedmemory: next is the newest and highest block, prev the oldest and lowest
 
  private:
+  int allocating = 0;  // allocations under way: a collection may allocate too
+
   unsigned char* storage_end() const { return base + size; }
   allocatedmemory* newest() const { return static_cast<allocatedmemory*>(blocks.next); }
   void invalidate_blocks();
