@@ -186,7 +186,7 @@ class mesh_fixture : public toolkit_fixture {
     const auto hsl = static_cast<jshort>(r.between(-32768, 32767));
     const jbyte lighting = static_cast<jbyte>(r.one_in(5) ? 6 : 1);
     const jbyte grey = byte(r.one_in(2)), bright = byte(r.one_in(2)), u = byte(r.one_in(4)), v = byte(r.one_in(4));
-    const jboolean flat = flag(5), hidden = flag(9), wrap_u = flag(3), wrap_v = flag(3);
+    const jboolean flat = flag(5), hidden = flag(9) != 0 && id < textures - 3, wrap_u = flag(3), wrap_v = flag(3);
     const jshort name = static_cast<jshort>(id);
     if (pixels == nullptr) {
       Java_ja_V(env, peer, name, hsl, alpha, lighting, 0, 0, 0, grey, bright, u, v, flat, hidden, 0, wrap_u, wrap_v, 0,

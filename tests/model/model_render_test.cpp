@@ -217,7 +217,7 @@ TEST_F(ModelRenderTest, SteadyFramesAllocateNothing) {
 TEST_F(ModelRenderTest, ShortPoolsLoseNothing) {
   test_random r(16);
   Mesh mesh = random_mesh(r, true);
-  while (mesh.inputfacecount < 30 || !mesh.ftype || mesh.mappingcount > 0) mesh = random_mesh(r, true);
+  while (mesh.inputfacecount < 30 || !mesh.ftype || !mesh.falpha || mesh.mappingcount > 0) mesh = random_mesh(r, true);
   const auto new_target = [this] {
     test_random state(5);
     random_state(state);
