@@ -73,7 +73,7 @@ final class Carpentry {
 
   static Mesh boulder(int seed) {
     Sculptor s = new Sculptor();
-    s.ball(20, 75, 0.72, 0.24, seed, wrapped(0xC4BFB6, Textures.ROCK, new TextureMapping.Cube(150)));
+    s.ball(20, 75, 0.72, 0.24, seed, wrapped(0xB9B3AA, Textures.GRAIN, new TextureMapping.Cube(150)));
     return s.build();
   }
 
@@ -82,12 +82,12 @@ final class Carpentry {
     Sculptor s = new Sculptor().at(0, 0, 0, angle);
     double w = 400 + 120 * Noise.hash(seed + 31);
     double d = 320;
-    double wall = 205;
+    double wall = 240;
     if (windowsOnly) {
       Material glass = plain(0xFFFFFF, lit ? Textures.LIT_WINDOW : Textures.DARK_WINDOW);
       for (double x : new double[] {-w / 2 + 85, w / 2 - 85}) {
-        pane(s, x, 105, -d / 2 - 5, 74, glass, false);
-        pane(s, -x, 105, d / 2 + 5, 74, glass, true);
+        pane(s, x, 92, -d / 2 - 5, 82, glass, false);
+        pane(s, -x, 92, d / 2 + 5, 82, glass, true);
       }
       return s.build();
     }
@@ -101,17 +101,20 @@ final class Carpentry {
     s.panel(new double[] {r, wall, f, r, 30, f, l, 30, f, l, wall, f}, PLASTER, walls, 1);
     s.panel(new double[] {l, wall, f, l, 30, f, l, 30, n, l, wall, n}, PLASTER, 2, 1);
     s.panel(new double[] {r, wall, n, r, 30, n, r, 30, f, r, wall, f}, PLASTER, 2, 1);
-    double ridge = 400;
+    double ridge = 432;
     s.gable(new double[] {l, ridge - 12, 0, l, wall, f, l, wall, n}, PLASTER);
     s.gable(new double[] {r, ridge - 12, 0, r, wall, n, r, wall, f}, PLASTER);
     int[] reds = {0xB5532F, 0xA6482E, 0x8F5A38, 0xC06A3A};
     Material tiles = plain(reds[seed & 3], Textures.SHINGLES);
     double a = l - 50;
     double b = r + 50;
-    double eave = 172;
-    double out = d / 2 + 55;
+    double eave = 214;
+    double out = d / 2 + 42;
     s.panel(new double[] {a, ridge, 0, a, eave, -out, b, eave, -out, b, ridge, 0}, tiles, 3, 2);
     s.panel(new double[] {b, ridge, 0, b, eave, out, a, eave, out, a, ridge, 0}, tiles, 3, 2);
+    Material under = plain(0x6A5440, Textures.PLANKS);
+    s.panel(new double[] {b, ridge - 6, 0, b, eave - 6, -out, a, eave - 6, -out, a, ridge - 6, 0}, under, 3, 2);
+    s.panel(new double[] {a, ridge - 6, 0, a, eave - 6, out, b, eave - 6, out, b, ridge - 6, 0}, under, 3, 2);
     // The roof's thickness, on all four edges.
     Material edge = plain(0xA88860, Textures.PLANKS);
     for (int side = -1; side <= 1; side += 2) {
@@ -122,7 +125,7 @@ final class Carpentry {
       s.panel(new double[] {a * -side, eave, out * side, a * -side, eave - 20, out * side, b * -side, eave - 20,
           out * side, b * -side, eave, out * side}, edge, 3, 0.2);
     }
-    s.box(w * 0.28, 250, 40, 62, 210, 62, STONE, 90);
+    s.box(w * 0.28, 290, 40, 62, 215, 62, STONE, 90);
     s.box(0, 20, n - 6, 92, 150, 14, plain(0x9A7048, Textures.PLANKS), 90);
     s.box(0, -60, n - 40, 150, 92, 80, STONE, 100);
     return s.build();
@@ -288,7 +291,7 @@ final class Carpentry {
     for (int i = 0; i < 9; i++) {
       double a = 2 * Math.PI * i / 9;
       s.at(62 * Math.cos(a), 0, 62 * Math.sin(a));
-      s.ball(6, 18, 0.8, 0.2, i, wrapped(0xB0ABA2, Textures.ROCK, new TextureMapping.Cube(60)));
+      s.ball(6, 18, 0.8, 0.2, i, wrapped(0xA8A39A, Textures.GRAIN, new TextureMapping.Cube(60)));
     }
     for (int i = 0; i < 4; i++) {
       s.at(0, 0, 0, 0.4 + i * Math.PI / 4);
@@ -344,10 +347,11 @@ final class Carpentry {
     return s.build();
   }
 
-  /** A puff of smoke or spray. */
-  static Mesh puff(int rgb, int transparency) {
+  /** A puff of smoke or spray that is seen from the south. */
+  static Mesh puff(int rgb, int thinness) {
     Sculptor s = new Sculptor();
-    s.ball(0, 40, 0.9, 0.1, transparency, Material.of(Hsl.ofRgb(rgb)).transparent(transparency));
+    Material cloud = plain(rgb, Textures.PUFF + thinness);
+    s.panel(new double[] {-60, 60, 0, -60, -60, 0, 60, -60, 0, 60, 60, 0}, cloud, 1, 1);
     return s.build();
   }
 }

@@ -7,29 +7,29 @@ import velmark5.Sun;
 final class Daylight {
   private static final double DAY_SECONDS = 240;
 
-  /** The show starts in the late afternoon. */
-  private static final double START = 0.655;
+  /** The show starts in the afternoon. */
+  private static final double START = 0.605;
 
   // Times of the day as parts of it, and the colours at them: zenith, middle of the sky, horizon, sun.
   private static final double[] TIMES = {0, 0.22, 0.27, 0.34, 0.50, 0.62, 0.70, 0.755, 0.80, 0.86, 1};
   private static final int[] ZENITH = {
-    0xFF050B1E, 0xFF0C1838, 0xFF2C4A80, 0xFF3A78C4, 0xFF2F74CC, 0xFF3672C0, 0xFF3A5F9E, 0xFF2E3A6C, 0xFF141C40,
+    0xFF050B1E, 0xFF0C1838, 0xFF2C4A80, 0xFF3A78C4, 0xFF2F74CC, 0xFF3672C0, 0xFF3A68B4, 0xFF2E3A6C, 0xFF141C40,
     0xFF070D24, 0xFF050B1E
   };
   private static final int[] MIDDLE = {
-    0xFF0B1530, 0xFF253258, 0xFF8C86A0, 0xFF86B6E4, 0xFF78B2EC, 0xFF86B4DC, 0xFFA8A8B8, 0xFF8A6A88, 0xFF33345C,
+    0xFF0B1530, 0xFF253258, 0xFF8C86A0, 0xFF86B6E4, 0xFF78B2EC, 0xFF86B4DC, 0xFFA4BCDC, 0xFF9A7490, 0xFF33345C,
     0xFF101B3A, 0xFF0B1530
   };
   private static final int[] HORIZON = {
-    0xFF16233F, 0xFF5A4A60, 0xFFF0B088, 0xFFD8E4EC, 0xFFCFE2F0, 0xFFE4DCC8, 0xFFF6C890, 0xFFE8865C, 0xFF6A4A60,
+    0xFF16233F, 0xFF5A4A60, 0xFFF0B088, 0xFFD8E4EC, 0xFFCFE2F0, 0xFFE8E4DA, 0xFFF8DCB4, 0xFFE8865C, 0xFF6A4A60,
     0xFF1E2B4A, 0xFF16233F
   };
   private static final int[] LIGHT = {
     0xFF8FA8E0, 0xFF9098C0, 0xFFF0B090, 0xFFFFF0D8, 0xFFFFFCF0, 0xFFFFF0D0, 0xFFFFDCA4, 0xFFF0A078, 0xFF9A88B0,
     0xFF8FA8E0, 0xFF8FA8E0
   };
-  private static final double[] AMBIENT = {0.20, 0.24, 0.44, 0.66, 0.74, 0.70, 0.62, 0.46, 0.28, 0.20, 0.20};
-  private static final double[] FRONT = {0.28, 0.22, 0.55, 0.75, 0.80, 0.85, 0.92, 0.55, 0.26, 0.28, 0.28};
+  private static final double[] AMBIENT = {0.36, 0.38, 0.48, 0.66, 0.76, 0.74, 0.68, 0.52, 0.42, 0.36, 0.36};
+  private static final double[] FRONT = {0.34, 0.26, 0.60, 0.80, 0.85, 0.95, 1.05, 0.62, 0.28, 0.34, 0.34};
 
   private double time;
   private int part;

@@ -54,7 +54,7 @@ final class Firmament implements Scene {
         dense *= Math.min(1, (tall - y) / 26.0) * Math.min(1, puffs * 3);
         double bright = Math.min(1, 0.80 + 0.24 * (1 - y / (double) tall) + 0.12 * (wisps - 0.5));
         int v = (int) (255 * bright);
-        pixels[y * wide + x] = Colour.argb((int) (225 * dense), v, v, v);
+        pixels[y * wide + x] = Colour.argb((int) (250 * dense), v, v, v);
       }
     }
     return toolkit.createSprite(pixels, wide, tall, wide, false);
@@ -164,7 +164,7 @@ final class Firmament implements Scene {
   }
 
   private void paintClouds(double seconds) {
-    int lit = Colour.mix(Colour.mix(day.light(), Colour.WHITE, 0.45), day.horizon(), 0.25);
+    int lit = Colour.mix(Colour.mix(day.light(), Colour.WHITE, 0.70), day.horizon(), 0.12);
     int tone = Colour.mix(lit, 0xFF1C2440, day.night() * 0.9);
     for (int i = 0; i < CLOUDS; i++) {
       double angle = 2 * Math.PI * (i + 0.6 * Noise.hash(i + 700)) / CLOUDS + seconds * 0.004;

@@ -64,8 +64,9 @@ final class Grounds {
       return;
     }
     double steep = Island.slope(x, z);
-    boolean rocky = steep > 0.95 || h > 760;
-    int rgb = colour(x, z, h, steep);
+    boolean bank = h < 125 && Island.riverDistance(x, z) < 260;
+    boolean rocky = steep > 0.95 && !bank || h > 760;
+    int rgb = colour(x, z, h, bank ? 0 : steep);
     s.face(a, b, c, x, -1e5, z, Material.of(Hsl.ofRgb(rgb)).textured(rocky ? Textures.ROCK : Textures.GRAIN, rocky ? rock : grain));
   }
 
@@ -82,7 +83,7 @@ final class Grounds {
       return velmark5.Colour.mix(0xFFD8C890, 0xFF2E6070, Math.min(1, -h / 110));
     }
     if (Island.riverDistance(x, z) < 62 && h < 100) {
-      return velmark5.Colour.mix(0xFFB8A880, 0xFF9C9078, patch);
+      return velmark5.Colour.mix(0xFFB4A878, 0xFF98986A, patch);
     }
     if (h < 24 + 14 * patch) {
       return velmark5.Colour.mix(0xFFE8D6A0, 0xFFF2E4B8, patch + fine * 0.4);
@@ -124,7 +125,7 @@ final class Grounds {
     return s.build();
   }
 
-  /** The river below the fall, and the brook on the cliff above it. */
+  /** The river below the fall. */
   static Mesh river() {
     Sculptor s = new Sculptor();
     List<double[]> course = Island.RIVER;
@@ -146,16 +147,6 @@ final class Grounds {
     for (int k = 0; k < 3; k++) {
       s.strip(rows[k], rows[k + 1], water);
     }
-    int[] left = new int[6];
-    int[] right = new int[6];
-    for (int i = 0; i < 6; i++) {
-      double z = 1376 + 66 * i;
-      double x = Island.FALL_X + 24 * Math.sin(i * 0.8);
-      double up = Math.max(Math.max(Island.height(x - 60, z), Island.height(x, z)), Island.height(x + 60, z)) + 10;
-      left[i] = s.corner(x - 62, up, z);
-      right[i] = s.corner(x + 62, up, z);
-    }
-    s.strip(left, right, water);
     return s.build();
   }
 
@@ -165,32 +156,46 @@ final class Grounds {
     double top = Island.height(Island.FALL_X, 1400) + 12;
     for (int sheet = 0; sheet < 2; sheet++) {
       double wide = sheet == 0 ? 78 : 60;
-      int rows = 9;
-      double[] before = null;
-      Material water = Carpentry.plain(0xFFFFFF, Textures.FALL);
+      int rows = 8;
+      double[][] edge = new double[rows + 1][];
       for (int i = 0; i <= rows; i++) {
         double t = i / (double) rows;
-        double[] here = {top + (80 - top) * t, 1392 - (125 + 40 * sheet) * Math.sqrt(t), wide + 26 * t};
-        if (before != null) {
-          s.panel(
-              new double[] {
-                Island.FALL_X - before[2], before[0], before[1], Island.FALL_X - here[2], here[0], here[1],
-                Island.FALL_X + here[2], here[0], here[1], Island.FALL_X + before[2], before[0], before[1]
-              },
-              water, 1, 3);
-        }
-        before = here;
+        edge[i] = new double[] {top + (80 - top) * t, 1392 - (125 + 40 * sheet) * Math.sqrt(t), wide + 26 * t};
       }
+      sheet(s, edge);
     }
+    // The steps above it, down the mountain's side.
+    double[][] steps = new double[6][];
+    for (int i = 0; i < steps.length; i++) {
+      double z = 1362 + 42 * (steps.length - 1 - i);
+      double up = 0;
+      for (int k = -1; k <= 1; k++) {
+        up = Math.max(up, Island.height(Island.FALL_X + 75 * k, z + 18));
+      }
+      steps[i] = new double[] {up + 34, z, 44 + 8 * i};
+    }
+    sheet(s, steps);
     return s.build();
   }
 
-  /** A soft shadow around what stands at a place: three discs that follow the ground. */
+  /** Falling water between level edges: height, z and half the width of each, from the top down. */
+  private static void sheet(Sculptor s, double[][] edges) {
+    double x = Island.FALL_X;
+    for (int i = 0; i + 1 < edges.length; i++) {
+      double[] a = edges[i];
+      double[] b = edges[i + 1];
+      s.panel(
+          new double[] {x - a[2], a[0], a[1], x - b[2], b[0], b[1], x + b[2], b[0], b[1], x + a[2], a[0], a[1]},
+          Carpentry.plain(0xFFFFFF, Textures.FALL), 1, 1);
+    }
+  }
+
+  /** A soft shadow around what stands at a place: four discs that follow the ground. */
   static void shadow(Sculptor s, double x, double z, double radius) {
-    int sides = 10;
-    for (int ring = 0; ring < 3; ring++) {
-      double r = radius * (1.25 - 0.3 * ring);
-      Material dark = Material.of(Hsl.of(0.6, 0.3, 0.02)).transparent(205);
+    int sides = 14;
+    for (int ring = 0; ring < 4; ring++) {
+      double r = radius * (1.3 - 0.24 * ring);
+      Material dark = Material.of(Hsl.of(0.6, 0.3, 0.02)).transparent(219);
       s.at(0, 0, 0);
       int middle = s.corner(x, Island.height(x, z) + 9, z);
       int[] rim = new int[sides];

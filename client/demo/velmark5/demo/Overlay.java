@@ -88,17 +88,16 @@ final class Overlay implements Scene {
   @Override
   public void paint(double seconds) {
     models = toolkit.takeModelCount();
-    int baseline = margin + title.ascent();
-    title.draw("velmark5", margin, baseline);
-    int line = baseline + body.lineHeight() + body.lineHeight() / 3;
-    shadowed(width + " × " + height + ", drawn by the processor alone", margin + 2, line, PALE);
-    line += body.lineHeight() * 5 / 4;
-    shadowed(rate + "   " + models + " models", margin + 2, line, GOLD);
-    line += body.lineHeight() * 5 / 4;
-    shadowed(day.clock(), margin + 2, line, PALE);
+    int step = body.lineHeight() * 5 / 4;
+    int line = height - margin;
     if (steered) {
-      shadowed("drag: look   W A S D: move   Q E: down, up   Shift: faster   F: fly", margin + 2, height - margin, PALE);
+      shadowed("drag: look   W A S D: move   Q E: down, up   Shift: faster   F: fly", margin + 2, line, PALE);
+      line -= step;
     }
+    shadowed(rate + "   " + models + " models   " + day.clock(), margin + 2, line, GOLD);
+    line -= step;
+    shadowed(width + " × " + height + ", drawn by the processor alone", margin + 2, line, PALE);
+    title.draw("velmark5", margin, line - step - body.lineHeight() / 4);
     paintMap();
   }
 

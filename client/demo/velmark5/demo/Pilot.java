@@ -101,18 +101,19 @@ final class Pilot {
   }
 
   private void fly(double seconds) {
-    double angle = -1.92 + seconds * 0.036;
-    double far = 2350 + 200 * Math.sin(seconds * 0.05);
+    double angle = -1.80 + seconds * 0.036;
+    // Far out over the bay in the south, close to the village under the cliffs in the north.
+    double far = 2020 - 760 * Math.sin(angle);
     x = 60 + far * Math.cos(angle);
     z = 60 + far * Math.sin(angle);
-    up = 900 + 170 * Math.sin(seconds * 0.06 - 0.4);
-    for (double ahead = 0; ahead < 700; ahead += 100) {
-      up = Math.max(up, Island.height(x - ahead * Math.sin(angle), z + ahead * Math.cos(angle)) + 420 - ahead * 0.4);
+    up = 930 + 120 * Math.sin(seconds * 0.06 - 0.4);
+    for (double ahead = -300; ahead <= 300; ahead += 100) {
+      up = Math.max(up, Island.height(x - ahead * Math.sin(angle), z + ahead * Math.cos(angle)) + 560 - Math.abs(ahead) * 0.4);
     }
-    double dx = 60 - x;
-    double dz = 120 - z;
+    double dx = 90 - x;
+    double dz = 60 - z;
     heading = Math.atan2(dx, dz);
-    pitch = Math.atan2(230 - up, Math.hypot(dx, dz));
+    pitch = Math.atan2(260 - up, Math.hypot(dx, dz));
   }
 
   private void steer(double passed) {

@@ -58,8 +58,11 @@ final class Textures implements TextureSource {
   /** A river's waves, which run faster. */
   static final int STREAM = 16;
 
+  /** Puffs of smoke or spray: the first of three, each thinner than the one before. */
+  static final int PUFF = 17;
+
   /** How many there are. */
-  static final int COUNT = 17;
+  static final int COUNT = 20;
 
   private static final int UNLIT = 6;
 
@@ -73,6 +76,7 @@ final class Textures implements TextureSource {
       case FALL -> metrics.withScroll(0, -72).withAlpha(TextureMetrics.Alpha.BLENDED);
       case VEIL -> metrics.withScroll(6, 14).withAlpha(TextureMetrics.Alpha.BLENDED).withLighting(UNLIT);
       case GLOW -> metrics.withAlpha(TextureMetrics.Alpha.BLENDED).withLighting(UNLIT).withWrap(false, false);
+      case PUFF, PUFF + 1, PUFF + 2 -> metrics.withAlpha(TextureMetrics.Alpha.BLENDED).withWrap(false, false);
       case FLAMES -> metrics.withScroll(0, 100).withAlpha(TextureMetrics.Alpha.BLENDED).withLighting(UNLIT);
       default -> metrics;
     };
@@ -103,6 +107,7 @@ final class Textures implements TextureSource {
       case GLOW -> glow(x, y);
       case DARK_WINDOW, LIT_WINDOW -> window(x, y, id == LIT_WINDOW);
       case FLAMES -> flames(x, y);
+      case PUFF, PUFF + 1, PUFF + 2 -> puff(x, y, 0.62 - 0.22 * (id - PUFF));
       default -> rock(x, y);
     };
   }
@@ -174,8 +179,8 @@ final class Textures implements TextureSource {
   }
 
   private static int fall(int x, int y) {
-    double streak = repeating(59, x * 3.0, y * 0.45, 0.07);
-    return Colour.withAlpha(Colour.mix(0xFF9CCFE0, 0xFFFFFFFF, streak * 1.3), (int) (110 + 145 * Math.min(1, streak * 1.5)));
+    double streak = repeating(59, x * 2.0, y * 0.35, 0.055);
+    return Colour.withAlpha(Colour.mix(0xFF9CCFE0, 0xFFFFFFFF, streak * 1.3), (int) (170 + 85 * Math.min(1, streak * 1.5)));
   }
 
   private static int veil(int x, int y) {
@@ -188,6 +193,14 @@ final class Textures implements TextureSource {
     double far = Math.hypot(x - 63.5, y - 63.5) / 63;
     double light = Math.pow(Math.max(0, 1 - far), 1.6);
     return Colour.argb((int) (150 * light), 255, 255, 255);
+  }
+
+  private static int puff(int x, int y, double dense) {
+    double rough = Noise.creased(71, x * 0.05, y * 0.05, 4);
+    double far = Math.hypot(x - 63.5, y - 63.5) / 62 + 0.45 * (rough - 0.5);
+    double alpha = Math.max(0, Math.min(1, 1.15 - 1.15 * far));
+    alpha *= Math.max(0, Math.min(1, (63 - Math.max(Math.abs(x - 63.5), Math.abs(y - 63.5))) / 8));
+    return Colour.withAlpha(grey(0.86 + 0.14 * rough), (int) (255 * dense * alpha * alpha));
   }
 
   private static int window(int x, int y, boolean lit) {

@@ -19,7 +19,7 @@ final class Village implements Scene {
 
   private static final double NEAR = 40;
   private static final double FAR = 9500;
-  private static final int FOG_BEGINS = 2300;
+  private static final int FOG_BEGINS = 2900;
   private static final int FLAME = 0xFF9A3C;
   private static final int WARM = 0xFFC070;
   private static final int UNEARTHLY = 0x50C8FF;
@@ -61,6 +61,8 @@ final class Village implements Scene {
   /** What stands still, and the numbers of the lamps that are nearest to it. */
   private record Prop(Model model, Matrix place, int[] lamps) {}
 
+  private record Puff(Model model, double size, double x, double up, double z) {}
+
   Village(Toolkit toolkit, MemoryPool pool, Pilot pilot, Daylight day) {
     this.toolkit = toolkit;
     this.pool = pool;
@@ -80,9 +82,9 @@ final class Village implements Scene {
     for (int robe : new int[] {0x8A3A34, 0x34548A, 0x5A7A3A}) {
       robes.add(model(Carpentry.wanderer(robe)));
     }
-    for (int transparency : new int[] {205, 225, 240}) {
-      smoke.add(model(Carpentry.puff(0xD8D4D0, transparency)));
-      spray.add(model(Carpentry.puff(0xFFFFFF, transparency)));
+    for (int thinness = 0; thinness < 3; thinness++) {
+      smoke.add(model(Carpentry.puff(0xE4E0DC, thinness)));
+      spray.add(model(Carpentry.puff(0xFFFFFF, thinness)));
     }
     placeLamps();
     placeHouses();
@@ -114,8 +116,8 @@ final class Village implements Scene {
   private void placeLamps() {
     double x = Island.VILLAGE_X;
     double z = Island.VILLAGE_Z;
-    lamps.add(new Lamp(x, Island.height(x, z) + 90, z, 420, FLAME, 1));
-    lamps.add(new Lamp(Island.MOUND_X, Island.height(Island.MOUND_X, Island.MOUND_Z) + 210, Island.MOUND_Z - 60, 380, UNEARTHLY, 0.4));
+    lamps.add(new Lamp(x, Island.height(x, z) + 90, z, 720, FLAME, 1));
+    lamps.add(new Lamp(Island.MOUND_X, Island.height(Island.MOUND_X, Island.MOUND_Z) + 210, Island.MOUND_Z - 60, 620, UNEARTHLY, 0.4));
     glow(x, z, 620, FLAME);
     glow(Island.MOUND_X, Island.MOUND_Z, 560, UNEARTHLY);
     double[][] posts = {{300, -190}, {690, -360}, {-490, -800}, {-350, -1420}, {-1010, 60}, {-20, -330}, {1010, -215}, {-340, -2010}};
@@ -124,7 +126,7 @@ final class Village implements Scene {
     Model lit = model(Carpentry.lampGlass(true));
     for (double[] p : posts) {
       double ground = Island.height(p[0], p[1]);
-      lamps.add(new Lamp(p[0], ground + 196, p[1], 230, WARM, 0.15));
+      lamps.add(new Lamp(p[0], ground + 196, p[1], 360, WARM, 0.15));
       glow(p[0], p[1], 330, WARM);
     }
     for (double[] p : posts) {
@@ -164,7 +166,7 @@ final class Village implements Scene {
       double cx = w * 0.28;
       double cz = 40;
       chimneys.add(new double[] {
-        x + cx * Math.cos(facing) + cz * Math.sin(facing), up + 470, z - cx * Math.sin(facing) + cz * Math.cos(facing)
+        x + cx * Math.cos(facing) + cz * Math.sin(facing), up + 515, z - cx * Math.sin(facing) + cz * Math.cos(facing)
       });
     }
     double x = Island.VILLAGE_X;
@@ -233,9 +235,10 @@ final class Village implements Scene {
       boolean free =
           up > 46 && up < 800 && Island.slope(x, z) < 0.62 && Island.pathDistance(x, z) > 130
               && Island.riverDistance(x, z) > 190 && Math.hypot(x - Island.VILLAGE_X, z - Island.VILLAGE_Z) > 960
-              && Math.hypot(x - Island.MOUND_X, z - Island.MOUND_Z) > 480
+              && Math.hypot(x - Island.MOUND_X, z - Island.MOUND_Z) > (z < Island.MOUND_Z ? 820 : 480)
               && Math.hypot(x - Island.MILL_X, z - Island.MILL_Z) > 300
-              && wood > 0.36
+              && wood > (z < -900 ? 0.50 : 0.36)
+              && (z > -1150 || Math.abs(x + 50) > 950)
               && taken.stream().noneMatch(p -> Math.hypot(p[0] - x, p[1] - z) < 135);
       if (!free) {
         continue;
@@ -347,7 +350,7 @@ final class Village implements Scene {
   private void drawWanderers(double seconds) {
     light(land.lamps);
     for (int i = 0; i < robes.size(); i++) {
-      double pace = seconds / 70 + i * 0.37;
+      double pace = seconds / 70 + 0.24 + i * 0.31;
       double[] p = Island.walk(pace - Math.floor(pace));
       double ground = Island.height(p[0], p[1]);
       double across = p[0] - 488;
@@ -384,35 +387,41 @@ final class Village implements Scene {
       double far = 700 + 130 * (i % 3) + 25 * i;
       double flap = 0.55 * Math.sin(seconds * 7 + i * 1.3) + 0.12;
       Matrix place =
-          Matrix.rotationY(-t)
-              .then(standing(100 + far * Math.cos(t), 560 + 60 * (i % 3) + 14 * Math.sin(seconds + i), 200 + far * Math.sin(t)));
+          Matrix.scaling(0.75, 0.75, 0.75)
+              .then(Matrix.rotationY(-t))
+              .then(standing(100 + far * Math.cos(t), 470 + 60 * (i % 3) + 14 * Math.sin(seconds + i), 200 + far * Math.sin(t)));
       resource.draw(wing, Matrix.rotationZ(-flap).then(place));
       resource.draw(wing, Matrix.rotationZ(-flap).then(Matrix.scaling(1, 1, -1)).then(Matrix.rotationY(Math.PI)).then(place));
     }
   }
 
+  /** Puffs turn to the camera and cover what is drawn after them, so the farthest comes first. */
   private void drawPuffs(double seconds) {
+    List<Puff> puffs = new ArrayList<>();
     for (double[] chimney : chimneys) {
-      for (int k = 0; k < 6; k++) {
-        double life = seconds * 0.11 + k / 6.0 + chimney[0] * 0.013;
+      for (int k = 0; k < 7; k++) {
+        double life = seconds * 0.10 + k / 7.0 + chimney[0] * 0.013;
         life -= Math.floor(life);
-        double size = 0.35 + 1.1 * life;
-        resource.draw(
-            smoke.get(Math.min(2, (int) (life * 3))),
-            Matrix.scaling(size, size, size)
-                .then(standing(chimney[0] + 130 * life * life, chimney[1] + 20 + 230 * life, chimney[2] + 30 * life)));
+        puffs.add(
+            new Puff(
+                smoke.get(Math.min(2, (int) (life * 3))), 0.35 + 1.3 * life, chimney[0] + 150 * life * life,
+                chimney[1] + 15 + 250 * life, chimney[2] + 30 * life));
       }
     }
-    for (int k = 0; k < 14; k++) {
-      double life = seconds * 0.35 + Noise.hash(k + 800);
+    for (int k = 0; k < 16; k++) {
+      double life = seconds * 0.3 + Noise.hash(k + 800);
       life -= Math.floor(life);
-      double size = 0.5 + 1.3 * life;
+      puffs.add(
+          new Puff(
+              spray.get(Math.min(2, (int) (life * 3))), 0.7 + 1.3 * life,
+              Island.FALL_X + 220 * (Noise.hash(k + 820) - 0.5), 100 + 80 * life,
+              1215 - 60 * Noise.hash(k + 840) - 60 * life));
+    }
+    puffs.sort(Comparator.comparingDouble(puff -> -Math.hypot(puff.x - pilot.x(), puff.z - pilot.z())));
+    Matrix facing = Matrix.rotationY(pilot.heading());
+    for (Puff puff : puffs) {
       resource.draw(
-          spray.get(Math.min(2, (int) (life * 3))),
-          Matrix.scaling(size, size, size)
-              .then(
-                  standing(
-                      Island.FALL_X + 190 * (Noise.hash(k + 820) - 0.5), 84 + 70 * life, 1225 - 60 * Noise.hash(k + 840) - 50 * life)));
+          puff.model, Matrix.scaling(puff.size, puff.size, puff.size).then(facing).then(standing(puff.x, puff.up, puff.z)));
     }
   }
 
