@@ -22,6 +22,11 @@ vector cross(const vector& p, const vector& q) {
 // Row r of the matrix times the vector.
 real row(const matrix& m, int r, const vector& p) { return m[3 * r] * p.x + m[3 * r + 1] * p.y + m[3 * r + 2] * p.z; }
 
+// Arcs in single precision. Rounded from the wide functions: the narrow ones differ between the word sizes.
+real narrow(real x) { return static_cast<float>(x); }
+real arctangent(real y, real x) { return narrow(std::atan2(narrow(y), narrow(x))); }
+real arcsine(real x) { return narrow(std::asin(narrow(x))); }
+
 texture_coordinates turned(texture_coordinates t, int direction) {
   switch (direction) {
     case 1:
@@ -66,15 +71,15 @@ texture_coordinates sphere_map(const vector& d, const matrix& m, int direction, 
   const real q1 = row(m, 1, d);
   const real q2 = row(m, 2, d);
   const real length = std::sqrt(q0 * q0 + q1 * q1 + q2 * q2);
-  const real u = atan2f(static_cast<float>(q0), static_cast<float>(q2)) / static_cast<real>(6.2831855f) + 0.5L;
-  const real v = asinf(static_cast<float>(q1 / length)) / static_cast<real>(3.1415927f) + 0.5L + vshift;
+  const real u = arctangent(q0, q2) / static_cast<real>(6.2831855f) + 0.5L;
+  const real v = arcsine(q1 / length) / static_cast<real>(3.1415927f) + 0.5L + vshift;
   return turned({static_cast<float>(u), static_cast<float>(v)}, direction);
 }
 
 texture_coordinates cylinder_map(const vector& d, const matrix& m, float wrap, int direction, float vshift) {
   const real q0 = row(m, 0, d);
   const real q2 = row(m, 2, d);
-  real u = atan2f(static_cast<float>(q0), static_cast<float>(q2)) / static_cast<real>(6.2831855f) + 0.5L;
+  real u = arctangent(q0, q2) / static_cast<real>(6.2831855f) + 0.5L;
   if (wrap != 1.0f) u *= wrap;
   const real v = row(m, 1, d) + 0.5L + vshift;
   return turned({static_cast<float>(u), static_cast<float>(v)}, direction);

@@ -4,6 +4,7 @@
 #include <functional>
 
 #include "model/mesh_fixture.h"
+#include "support/frame_record.h"
 #include "util/memorymanager/allocatedmemory.h"
 
 namespace {
@@ -98,6 +99,7 @@ class ModelBuildTest : public mesh_fixture {
 TEST_F(ModelBuildTest, RandomMeshesBecomeTheReferencesModels) {
   test_random random(1);
   int textured = 0, billboards = 0;
+  std::vector<float> coordinates;
   for (int n = 0; n < 1500; ++n) {
     SCOPED_TRACE(n);
     const Mesh mesh = random_mesh(random, false);
@@ -108,6 +110,9 @@ TEST_F(ModelBuildTest, RandomMeshesBecomeTheReferencesModels) {
     same_model(m, o);
     if (HasFailure()) break;
     textured += o.texfacecount;
+    for (const auto& corner : o.fuv) {
+      for (const oracle::Coordinates& c : corner) coordinates.insert(coordinates.end(), {c.u, c.v});
+    }
     billboards += static_cast<int>(o.billboards.size());
     EXPECT_EQ(Java_h_m(env, object), mesh.functionmask);
     EXPECT_EQ(Java_h_i(env, object) != 0, o.hasalpha || !o.falpha.empty());
@@ -134,6 +139,7 @@ TEST_F(ModelBuildTest, RandomMeshesBecomeTheReferencesModels) {
     Java_h_ma(env, object);
     ASSERT_EQ(allocatedmemory::allocated_size, 0);
   }
+  frame_record::add("models.texture_coordinates", coordinates.data(), coordinates.size());
   EXPECT_GT(textured, 5000);
   EXPECT_GT(billboards, 400);
 }

@@ -23,6 +23,7 @@ using real = long double;
 int truncate(float x) { return _mm_cvttss_si32(_mm_set_ss(x)); }
 int round_to_nearest(float x) { return _mm_cvtss_si32(_mm_set_ss(x)); }
 int word(int x) { return std::clamp(x, -32768, 32767); }
+real single(real x) { return static_cast<float>(x); }
 float lane(const Vector4_s& v, int i) { return (&v.x)[i]; }
 
 toolkit& kit() { return *toolkit::m_pInstance; }
@@ -327,7 +328,7 @@ void Model::texture_coordinates(const Mesh& mesh, const std::vector<int>& number
       for (int k = 0; k < 3; ++k) {
         const Real3 d = point(corner(i, k)) - centre;
         const real q0 = turned(d, 0), q1 = turned(d, 1), q2 = turned(d, 2);
-        const real turns = std::atan2(static_cast<float>(q0), static_cast<float>(q2)) / two_pi + 0.5L;
+        const real turns = single(std::atan2(single(q0), single(q2))) / two_pi + 0.5L;
         real s, t;
         if (type == 1) {
           s = turns * wrap;
@@ -341,7 +342,7 @@ void Model::texture_coordinates(const Mesh& mesh, const std::vector<int>& number
         } else {
           const real length = std::sqrt(q0 * q0 + q1 * q1 + q2 * q2);
           s = turns;
-          t = std::asin(static_cast<float>(q1 / length)) / pi + 0.5L + tu;
+          t = single(std::asin(single(q1 / length))) / pi + 0.5L + tu;
         }
         // Floats from here on: opposite corners lie half a period apart, and the last bit decides.
         u[k] = static_cast<float>(s), v[k] = static_cast<float>(t);
