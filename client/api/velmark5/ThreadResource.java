@@ -16,6 +16,9 @@ public interface ThreadResource extends AutoCloseable {
   /**
    * Draws a model on the toolkit's target. One thread at a time draws a model, each with its own resource.
    *
+   * <p>A model is in the distance fog as a whole or not at all: when an end of its upright axis lies beyond where the fog
+   * begins. Its light is that of its mesh as it was built: the matrix does not turn the sun's effect along.
+   *
    * @param model the model
    * @param matrix from the model to the world
    */

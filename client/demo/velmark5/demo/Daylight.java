@@ -8,7 +8,7 @@ final class Daylight {
   private static final double DAY_SECONDS = 240;
 
   /** The show starts in the afternoon. */
-  private static final double START = 0.605;
+  private static final double START = 0.660;
 
   // Times of the day as parts of it, and the colours at them: zenith, middle of the sky, horizon, sun.
   private static final double[] TIMES = {0, 0.22, 0.27, 0.34, 0.50, 0.62, 0.70, 0.755, 0.80, 0.86, 1};

@@ -20,6 +20,7 @@ final class Grounds {
   static Mesh land() {
     Sculptor s = new Sculptor();
     Sculptor origin = s.at(0, 0, 0);
+    lengthenAxis(s);
     TextureMapping grain = origin.groundPlane(300);
     TextureMapping rock = origin.groundPlane(420);
     int[][] grid = new int[TILES + 1][TILES + 1];
@@ -53,6 +54,15 @@ final class Grounds {
       }
     }
     return s.build();
+  }
+
+  /**
+   * Whether a model gets fog follows from the ends of its axis. What spreads as far as the land has a very long one, so
+   * that an end of it lies in the fog from nearly everywhere.
+   */
+  private static void lengthenAxis(Sculptor s) {
+    s.corner(0, 20000, 0);
+    s.corner(0, -20000, 0);
   }
 
   private static void tile(Sculptor s, int a, int b, int c, double[] pa, double[] pb, double[] pc, TextureMapping grain,
@@ -100,21 +110,25 @@ final class Grounds {
   /** The sea, but for the cells that the land hides. */
   static Mesh sea() {
     Sculptor s = new Sculptor();
+    lengthenAxis(s);
     TextureMapping waves = s.at(0, 0, 0).groundPlane(520);
     Material water = Carpentry.plain(0xFFFFFF, Textures.WAVES).textured(Textures.WAVES, waves).transparent(70);
-    int cell = 176;
-    int cells = 62;
+    // Small cells where the camera comes near, large ones out to the fog.
+    int cells = 64;
+    double[] lines = new double[cells + 1];
+    for (int i = 0; i <= cells; i++) {
+      int from = i - cells / 2;
+      lines[i] = from * 176 + Math.signum(from) * Math.max(0, Math.abs(from) - 20) * 250;
+    }
     int[][] grid = new int[cells + 1][cells + 1];
     for (int row = 0; row <= cells; row++) {
       for (int column = 0; column <= cells; column++) {
-        grid[row][column] = s.corner((column - cells / 2.0) * cell, 0, (row - cells / 2.0) * cell);
+        grid[row][column] = s.corner(lines[column], 0, lines[row]);
       }
     }
     for (int row = 0; row < cells; row++) {
       for (int column = 0; column < cells; column++) {
-        double x = (column + 0.5 - cells / 2.0) * cell;
-        double z = (row + 0.5 - cells / 2.0) * cell;
-        if (Island.inland(x, z) < 330) {
+        if (Island.inland((lines[column] + lines[column + 1]) / 2, (lines[row] + lines[row + 1]) / 2) < 330) {
           s.strip(
               new int[] {grid[row][column], grid[row][column + 1]},
               new int[] {grid[row + 1][column], grid[row + 1][column + 1]},

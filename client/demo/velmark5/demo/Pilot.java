@@ -16,6 +16,7 @@ import velmark5.Matrix;
 final class Pilot {
   private static final double CLEARANCE = 130;
   private static final double LIMIT = 4200;
+  private static final double CENTRE = 60;
 
   // Written by the thread of the window's events, read by the one that draws.
   private final Set<Integer> pressed = new HashSet<>();
@@ -100,12 +101,25 @@ final class Pilot {
     up = Math.max(up, Math.max(0, Island.height(x, z)) + CLEARANCE);
   }
 
+  /**
+   * How far out its way goes: over the bay in the south, close to the village under the cliffs in the north, around the mill in the
+   * west.
+   */
+  private static double orbit(double angle) {
+    double west = Math.max(0, -Math.cos(angle));
+    return 2120 - 660 * Math.sin(angle) + 430 * west * west;
+  }
+
+  /** How far a place is from the way on which the camera flies by itself. */
+  static double wayDistance(double x, double z) {
+    return Math.abs(Math.hypot(x - CENTRE, z - CENTRE) - orbit(Math.atan2(z - CENTRE, x - CENTRE)));
+  }
+
   private void fly(double seconds) {
-    double angle = -1.80 + seconds * 0.036;
-    // Far out over the bay in the south, close to the village under the cliffs in the north.
-    double far = 2020 - 760 * Math.sin(angle);
-    x = 60 + far * Math.cos(angle);
-    z = 60 + far * Math.sin(angle);
+    double angle = -1.78 + seconds * 0.036;
+    double far = orbit(angle);
+    x = CENTRE + far * Math.cos(angle);
+    z = CENTRE + far * Math.sin(angle);
     up = 930 + 120 * Math.sin(seconds * 0.06 - 0.4);
     for (double ahead = -300; ahead <= 300; ahead += 100) {
       up = Math.max(up, Island.height(x - ahead * Math.sin(angle), z + ahead * Math.cos(angle)) + 560 - Math.abs(ahead) * 0.4);

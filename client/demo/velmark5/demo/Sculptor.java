@@ -177,15 +177,19 @@ final class Sculptor {
     for (int i = 0; i + 1 < rings; i++) {
       double middle = (profile[2 * i + 1] + profile[2 * i + 3]) / 2;
       double slant = profile[2 * i] - profile[2 * i + 2];
-      // A point on the axis that lies behind the surface.
-      double behind = middle - Math.signum(slant) * 1e4;
+      double rise = profile[2 * i + 3] - profile[2 * i + 1];
+      // A point on the axis that lies behind the surface: where the line across it meets the axis, if it does.
+      double across = (profile[2 * i] + profile[2 * i + 2]) / 2 * slant / rise;
+      double behind = middle - (rise > 0 && Math.abs(across) < 1e4 ? across : Math.signum(slant) * 1e4);
       for (int k = 0; k < sides; k++) {
         int next = (k + 1) % sides;
+        // Bumpy rings are turned by half a step against each other; the diagonals follow.
+        boolean even = i % 2 == 0;
         if (profile[2 * i] != 0) {
-          face(ring[i][k], ring[i][next], ring[i + 1][next], 0, behind, 0, material);
+          face(ring[i][k], ring[i][next], ring[i + 1][even ? k : next], 0, behind, 0, material);
         }
         if (profile[2 * i + 2] != 0) {
-          face(ring[i][k], ring[i + 1][next], ring[i + 1][k], 0, behind, 0, material);
+          face(ring[i][even ? next : k], ring[i + 1][next], ring[i + 1][k], 0, behind, 0, material);
         }
       }
     }

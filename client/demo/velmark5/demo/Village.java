@@ -238,6 +238,7 @@ final class Village implements Scene {
               && Math.hypot(x - Island.MOUND_X, z - Island.MOUND_Z) > (z < Island.MOUND_Z ? 820 : 480)
               && Math.hypot(x - Island.MILL_X, z - Island.MILL_Z) > 300
               && wood > (z < -900 ? 0.50 : 0.36)
+              && Pilot.wayDistance(x, z) > 230
               && (z > -1150 || Math.abs(x + 50) > 950)
               && taken.stream().noneMatch(p -> Math.hypot(p[0] - x, p[1] - z) < 135);
       if (!free) {
