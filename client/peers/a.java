@@ -22,16 +22,7 @@ final class a extends Peer implements ThreadResource {
   native void K(long handle, int x0, int y0, int x1, int y1, int colour, int thickness, int mode);
 
   native void ra(
-      long unused,
-      float x0,
-      float y0,
-      float x1,
-      float y1,
-      float x2,
-      float y2,
-      int colour0,
-      int colour1,
-      int colour2);
+      long unused, float x0, float y0, float x1, float y1, float x2, float y2, int colour0, int colour1, int colour2);
 
   a(ja toolkit) {
     super(toolkit);

@@ -49,36 +49,45 @@ final class fa extends Peer implements Sprite {
   native void o(long handle, int x, int y, long mask, int maskX, int maskY);
 
   native void e(
-      long handle,
-      float x0,
-      float y0,
-      float x1,
-      float y1,
-      float x2,
-      float y2,
-      int colourOp,
-      int colour,
-      int blend);
+      long handle, float x0, float y0, float x1, float y1, float x2, float y2, int colourOp, int colour, int blend);
 
   native void FA(
-      long handle,
-      float x0,
-      float y0,
-      float x1,
-      float y1,
-      float x2,
-      float y2,
-      int unused,
-      long mask,
-      int maskX,
-      int maskY,
-      int blend);
+      long handle, float x0, float y0, float x1, float y1, float x2, float y2, int unused, long mask, int maskX,
+      int maskY, int blend);
 
   native void aa(long handle, int x, int y, int w, int h, int colourOp, int colour, int blend);
 
-  /** A peer with no native object yet; one of the natives above gives it one. */
+  /** A peer without a native object. */
   fa(ja toolkit) {
     super(toolkit);
+  }
+
+  /** An empty sprite. */
+  fa(ja toolkit, int width, int height) {
+    this(toolkit);
+    UA(0, width, height);
+  }
+
+  /** A sprite of colours. */
+  fa(ja toolkit, int[] pixels, int width, int height, int stride, boolean opaque) {
+    this(toolkit);
+    RA(0, pixels, 0, stride, width, height, opaque);
+  }
+
+  /** A sprite of numbers in a palette. */
+  fa(ja toolkit, int[] palette, byte[] indices, byte[] alpha, int width, int height, int stride) {
+    this(toolkit);
+    EA(0, palette, indices, alpha, 0, stride, width, height);
+  }
+
+  /** A sprite of a part of the frame. */
+  fa(ja toolkit, Rect area, boolean opaque) {
+    this(toolkit);
+    try {
+      K(0, area.x(), area.y(), area.width(), area.height(), opaque);
+    } catch (Exception e) {
+      throw translated(e);
+    }
   }
 
   @Override
@@ -161,27 +170,13 @@ final class fa extends Peer implements Sprite {
   @Override
   public void drawScaled(Rect box, Tint tint, BlendMode mode) {
     ha(
-        handle(),
-        box.x(),
-        box.y(),
-        box.width(),
-        box.height(),
-        tint.operation().code(),
-        tint.colour(),
-        mode.code());
+        handle(), box.x(), box.y(), box.width(), box.height(), tint.operation().code(), tint.colour(), mode.code());
   }
 
   @Override
   public void drawScaled(Rect box, int depth, Tint tint, BlendMode mode) {
     G(
-        handle(),
-        box.x(),
-        box.y(),
-        depth,
-        box.width(),
-        box.height(),
-        tint.operation().code(),
-        tint.colour(),
+        handle(), box.x(), box.y(), depth, box.width(), box.height(), tint.operation().code(), tint.colour(),
         mode.code());
   }
 
@@ -198,15 +193,7 @@ final class fa extends Peer implements Sprite {
 
   @Override
   public void drawAcross(
-      float x0,
-      float y0,
-      float x1,
-      float y1,
-      float x2,
-      float y2,
-      ClippingMask mask,
-      int maskX,
-      int maskY,
+      float x0, float y0, float x1, float y1, float x2, float y2, ClippingMask mask, int maskX, int maskY,
       BlendMode mode) {
     if (mode == BlendMode.ADD) {
       throw new IllegalArgumentException("mode: a masked sprite cannot be added");
@@ -220,13 +207,7 @@ final class fa extends Peer implements Sprite {
       throw new IllegalArgumentException("sprite: " + fullWidth() + "x" + fullHeight() + " cannot fill an area");
     }
     aa(
-        handle(),
-        area.x(),
-        area.y(),
-        area.width(),
-        area.height(),
-        tint.operation().code(),
-        tint.colour(),
+        handle(), area.x(), area.y(), area.width(), area.height(), tint.operation().code(), tint.colour(),
         mode.code());
   }
 }
