@@ -3,6 +3,8 @@
 // that whole targets can be compared bit for bit.
 #pragma once
 
+#include <compare>
+
 #include "raster/Triangle.h"
 
 namespace oracle {
@@ -19,6 +21,8 @@ struct TriangleModes {
   bool depth_write;
   bool colour_write;
   bool depth_test;
+
+  auto operator<=>(const TriangleModes&) const = default;
 };
 
 void render_triangle(const TriangleModes& modes, const Rasterizer_n::Triangle_s& triangle);
