@@ -316,28 +316,3 @@ TEST_F(ModelRenderTest, ModelsOfAPoolThatIsGone) {
   EXPECT_EQ(java.nativeid(object), 0);
   EXPECT_EQ(Java_ja_za(env, peer), 0);
 }
-
-TEST(ModelInstances, AreTheListed24) {
-  std::FILE* const symbols = popen("nm -C '" VELMARK5_LIBRARY "'", "r");
-  ASSERT_NE(symbols, nullptr);
-  std::set<std::string> found;
-  char line[4096];
-  const std::string start = "model::render2<";
-  while (std::fgets(line, sizeof line, symbols) != nullptr) {
-    const std::string text = line;
-    if (const auto at = text.find(start); at != std::string::npos) {
-      found.insert(text.substr(at + start.size(), text.find(">(", at) - at - start.size()));
-    }
-  }
-  pclose(symbols);
-  std::set<std::string> expected;
-  for (int i = 0; i < 24; ++i) {
-    // Point lit, distance fog, height fog, colour, depth.
-    std::string arguments;
-    for (const bool b : {(i & 1) != 0, (i & 2) != 0, (i & 4) != 0, i < 16, i >= 16 || (i & 8) != 0}) {
-      arguments += std::string(arguments.empty() ? "" : ", ") + (b ? "true" : "false");
-    }
-    expected.insert(arguments);
-  }
-  EXPECT_EQ(found, expected);
-}
