@@ -66,15 +66,17 @@ class mesh_fixture : public toolkit_fixture {
     const auto range = [&r](int low, int high) { return [&r, low, high] { return r.between(low, high); }; };
     m.vertexcount = r.between(4, 60);
     m.meshvertexcount = r.one_in(3) ? r.between(4, m.vertexcount) : m.vertexcount;
-    for (auto* axis : {&m.x, &m.y, &m.z}) list(*axis, m.vertexcount, 1, range(-120, 120));
-    // Four points that span a volume.
-    for (int i = 0; i < 4; ++i) (*m.x)[i] = i == 1 ? 90 : 0, (*m.y)[i] = i == 2 ? 95 : 0, (*m.z)[i] = i == 3 ? 99 : 0;
+    for (int axis = 0; axis < 3; ++axis) {
+      list(m.position[axis], m.vertexcount, 1, range(-120, 120));
+      // Four points that span a volume.
+      for (int i = 0; i < 4; ++i) (*m.position[axis])[i] = i == axis + 1 ? 90 + 4 * axis : 0;
+    }
     const int top_label = r.one_in(5) ? 255 : 9;
     list(m.vertexlabels, m.vertexcount, 2, range(-2, top_label));
     list(m.vmask, r.between(0, 70), 2, range(-32768, 32767));
 
     const int n = m.inputfacecount = r.between(drawn ? 1 : 0, most_faces);
-    for (auto* corner : {&m.a, &m.b, &m.c}) list(*corner, n, 1, range(0, m.meshvertexcount - 1));
+    for (auto& corner : m.corner) list(corner, n, 1, range(0, m.meshvertexcount - 1));
     list(m.ftype, n, 2, [&] { return r.one_in(5) ? 2 : r.one_in(8) && !drawn ? r.between(3, 255) : r.between(0, 1); });
     list(m.fpriority, n, 2, range(-128, 127));
     list(m.falpha, n, 2, [&] { return r.one_in(8) ? 255 : r.one_in(2) ? 0 : r.between(1, 254); });
@@ -89,27 +91,25 @@ class mesh_fixture : public toolkit_fixture {
       list(m.fmapping, n, r.one_in(4) ? 2 : 1, [&] { return k == 0 || r.one_in(5) ? -1 : r.between(0, k - 1); });
     }
     list(m.mappingtype, k, 1, range(0, 4));
-    for (auto* axis : {&m.mappingp, &m.mappingm, &m.mappingn}) axis->emplace();
-    for (int i = 0; i < k; ++i) {
-      float x = r.real(-1, 1), y = r.real(-1, 1), z = r.real(-1, 1);
-      if (r.one_in(4)) x = z = 0;
-      const float scale = 32767 / std::sqrt(x * x + y * y + z * z);
-      const bool plane = (*m.mappingtype)[i] == 0;
-      const int first = r.between(0, 3);
-      m.mappingp->push_back(static_cast<std::int16_t>(plane ? first : static_cast<int>(x * scale)));
-      m.mappingm->push_back(static_cast<std::int16_t>(plane ? (first + 1) % 4 : static_cast<int>(y * scale)));
-      m.mappingn->push_back(static_cast<std::int16_t>(plane ? (first + 2) % 4 : static_cast<int>(z * scale)));
+    for (int axis = 0; axis < 3; ++axis) {
+      m.mappingaxis[axis].emplace();
+      list(m.mappingscale[axis], k, 1, [&] { return r.between(1, 3000) * (r.one_in(4) ? -1 : 1); });
+      list(m.mappingtranslate[axis], k, 1, range(-999, 999));
     }
-    for (auto* scale : {&m.mappingscalex, &m.mappingscaley, &m.mappingscalez}) {
-      list(*scale, k, 1, [&] { return r.between(1, 3000) * (r.one_in(4) ? -1 : 1); });
-      if (scale == &m.mappingscalex) {
-        for (int i = 0; i < k; ++i)
-          if ((*m.mappingtype)[i] == 1 && r.one_in(3)) (**scale)[i] = 0;
+    for (int i = 0; i < k; ++i) {
+      // A direction, or vertices that span a plane.
+      float to[3] = {r.real(-1, 1), r.real(-1, 1), r.real(-1, 1)};
+      if (r.one_in(4)) to[0] = to[2] = 0;
+      const float scale = 32767 / std::sqrt(to[0] * to[0] + to[1] * to[1] + to[2] * to[2]);
+      const int type = (*m.mappingtype)[i], first = r.between(0, 3);
+      for (int axis = 0; axis < 3; ++axis) {
+        const int value = type == 0 ? (first + axis) % 4 : static_cast<int>(to[axis] * scale);
+        m.mappingaxis[axis]->push_back(static_cast<std::int16_t>(value));
       }
+      if (type == 1 && r.one_in(3)) (*m.mappingscale[0])[i] = 0;
     }
     list(m.mappingrotation, k, 1, range(-128, 127));
     list(m.mappingdirection, k, 1, range(0, 5));
-    for (auto* t : {&m.mappingtranslatex, &m.mappingtranslatey, &m.mappingtranslatez}) list(*t, k, 1, range(-999, 999));
 
     m.emittercount = r.between(0, 2);
     m.effectorcount = r.between(0, 2);
@@ -143,13 +143,14 @@ class mesh_fixture : public toolkit_fixture {
     const auto ints = [this](const Mesh::ints& v) { return v ? java.new_ints({v->begin(), v->end()}) : nullptr; };
     const auto shorts = [this](const Mesh::shorts& v) { return v ? java.new_shorts({v->begin(), v->end()}) : nullptr; };
     const auto bytes = [this](const Mesh::bytes& v) { return v ? java.new_bytes({v->begin(), v->end()}) : nullptr; };
-    Java_h_U(env, object, nullptr, pool_peer, m.vertexcount, m.meshvertexcount, ints(m.x), ints(m.y), ints(m.z),
-             ints(m.vertexlabels), shorts(m.vmask), m.inputfacecount, shorts(m.a), shorts(m.b), shorts(m.c),
-             bytes(m.ftype), bytes(m.fpriority), bytes(m.falpha), bytes(m.fmapping), shorts(m.fhsl), shorts(m.ftex),
-             ints(m.facelabels), m.priority, shorts(m.fmask), m.mappingcount, bytes(m.mappingtype), shorts(m.mappingp),
-             shorts(m.mappingm), shorts(m.mappingn), ints(m.mappingscalex), ints(m.mappingscaley),
-             ints(m.mappingscalez), bytes(m.mappingrotation), bytes(m.mappingdirection), ints(m.mappingtranslatex),
-             ints(m.mappingtranslatey), ints(m.mappingtranslatez), ints(m.pslist), m.emittercount, m.effectorcount,
+    Java_h_U(env, object, nullptr, pool_peer, m.vertexcount, m.meshvertexcount, ints(m.position[0]),
+             ints(m.position[1]), ints(m.position[2]), ints(m.vertexlabels), shorts(m.vmask), m.inputfacecount,
+             shorts(m.corner[0]), shorts(m.corner[1]), shorts(m.corner[2]), bytes(m.ftype), bytes(m.fpriority),
+             bytes(m.falpha), bytes(m.fmapping), shorts(m.fhsl), shorts(m.ftex), ints(m.facelabels), m.priority,
+             shorts(m.fmask), m.mappingcount, bytes(m.mappingtype), shorts(m.mappingaxis[0]), shorts(m.mappingaxis[1]),
+             shorts(m.mappingaxis[2]), ints(m.mappingscale[0]), ints(m.mappingscale[1]), ints(m.mappingscale[2]),
+             bytes(m.mappingrotation), bytes(m.mappingdirection), ints(m.mappingtranslate[0]),
+             ints(m.mappingtranslate[1]), ints(m.mappingtranslate[2]), ints(m.pslist), m.emittercount, m.effectorcount,
              m.functionmask, m.flags, m.ambient, m.contrast, ints(m.billboarddata));
   }
 

@@ -262,9 +262,9 @@ TEST_F(ModelRenderTest, ShortPoolsLoseNothing) {
 TEST_F(ModelRenderTest, Quirks) {
   Mesh mesh;
   mesh.vertexcount = mesh.meshvertexcount = 3;
-  mesh.x = {{-5, 100, -5}}, mesh.y = {{-60, 60, 60}}, mesh.z = {{0, 0, 0}};
+  mesh.position[0] = {{-5, 100, -5}}, mesh.position[1] = {{-60, 60, 60}}, mesh.position[2] = {{0, 0, 0}};
   mesh.inputfacecount = 1;
-  mesh.a = {{0}}, mesh.b = {{2}}, mesh.c = {{1}};
+  mesh.corner[0] = {{0}}, mesh.corner[1] = {{2}}, mesh.corner[2] = {{1}};
   mesh.fhsl = {{0}};
   mesh.ftype = {{1}};
   make_target(width, height);

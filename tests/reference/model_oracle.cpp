@@ -1,16 +1,13 @@
 #include "reference/model_oracle.h"
 
-#include <xmmintrin.h>
-
 #include <algorithm>
-#include <bit>
 #include <cmath>
 
 #include "maths/colourutils.h"
 #include "maths/mymath.h"
 #include "raster/Rasterizer.h"
+#include "reference/numbers.h"
 #include "reference/triangle_oracle.h"
-#include "texture/texturecache.h"
 #include "toolkit/toolkit.h"
 
 using namespace Rasterizer_n;
@@ -19,22 +16,10 @@ namespace oracle {
 namespace {
 
 using real = long double;
-
-int truncate(float x) { return _mm_cvttss_si32(_mm_set_ss(x)); }
-int round_to_nearest(float x) { return _mm_cvtss_si32(_mm_set_ss(x)); }
-int word(int x) { return std::clamp(x, -32768, 32767); }
 real single(real x) { return static_cast<float>(x); }
-float lane(const Vector4_s& v, int i) { return (&v.x)[i]; }
 
 toolkit& kit() { return *toolkit::m_pInstance; }
 const texturemetrics* metrics(std::int16_t id) { return kit().textures->getmetrics(static_cast<unsigned short>(id)); }
-
-template <class T, class U>
-void copy(std::vector<T>& out, const std::optional<std::vector<U>>& in) {
-  if (in) out.assign(in->begin(), in->end());
-}
-
-// --- Numbers of three -----------------------------------------------------------------------------------------------
 
 struct Real3 {
   real x, y, z;
@@ -44,13 +29,13 @@ Real3 operator-(Real3 a, Real3 b) { return {a.x - b.x, a.y - b.y, a.z - b.z}; }
 real dot(Real3 a, Real3 b) { return a.x * b.x + a.y * b.y + a.z * b.z; }
 Real3 cross(Real3 a, Real3 b) { return {a.y * b.z - a.z * b.y, a.z * b.x - a.x * b.z, a.x * b.y - a.y * b.x}; }
 
-Labels group(int items, const std::vector<int>& label, const std::vector<int>& member) {
+// Members that are not negative, by their labels.
+Labels group(const std::vector<int>& label, const std::vector<int>& member) {
   Labels groups;
-  int highest = -1;
-  for (int i = 0; i < items; ++i) {
-    if (member[i] >= 0) highest = std::max(highest, label[i]);
-  }
-  for (int l = 0; l <= std::max(highest, 0); ++l) {
+  const int items = static_cast<int>(label.size());
+  int highest = 0;
+  for (int i = 0; i < items; ++i) highest = std::max(highest, member[i] < 0 ? 0 : label[i]);
+  for (int l = 0; l <= highest; ++l) {
     const auto start = static_cast<int>(groups.members.size());
     for (int i = 0; i < items; ++i) {
       if (label[i] == l && member[i] >= 0) groups.members.push_back(static_cast<unsigned short>(member[i]));
@@ -60,38 +45,103 @@ Labels group(int items, const std::vector<int>& label, const std::vector<int>& m
   return groups;
 }
 
-// The mapping's rotation: y to the direction, a turn about it, scaled rows.
-void mapping_matrix(const Mesh& mesh, int m, real (&rows)[3][3]) {
-  const int type = (*mesh.mappingtype)[m];
-  const int sx = (*mesh.mappingscalex)[m], sy = (*mesh.mappingscaley)[m], sz = (*mesh.mappingscalez)[m];
-  const auto f = [](int i) { return static_cast<float>(i); };
-  float scale[3] = {f(sx) / 1024, f(sy) / 1024, f(sz) / 1024};
-  if (type == 1) {
-    scale[0] = sx < 0 ? -f(sx) / 1024 : 1;
-    scale[1] = 64 / f(sy);
-    scale[2] = sx > 0 ? f(sx) / 1024 : 1;
-  } else if (type == 2) {
-    scale[0] = 64 / f(sx), scale[1] = 64 / f(sy), scale[2] = 64 / f(sz);
+// --- Texture mappings -----------------------------------------------------------------------------------------------
+
+// A mapping that is no plane.
+struct Mapping {
+  Mapping(const Mesh& mesh, int m);
+
+  // `from` as seen along the mapping's own axes.
+  real along(int axis, Real3 from) const { return dot(rows[axis], from); }
+
+  int type, direction;
+  float scale[3], wrap;
+  real translate[3];
+  Real3 rows[3];
+};
+
+// y to the direction, a turn about it, scaled rows.
+Mapping::Mapping(const Mesh& mesh, int m) : type((*mesh.mappingtype)[m]), direction((*mesh.mappingdirection)[m]) {
+  int p[3];
+  for (int k = 0; k < 3; ++k) {
+    p[k] = (*mesh.mappingaxis[k])[m];
+    scale[k] = static_cast<float>((*mesh.mappingscale[k])[m]);
+    translate[k] = static_cast<real>((*mesh.mappingtranslate[k])[m]) / 256;
   }
-  const int x = (*mesh.mappingp)[m], y = (*mesh.mappingm)[m], z = (*mesh.mappingn)[m];
-  const real c = static_cast<real>(y) / 32767, s = -std::sqrt(1 - c * c), t = 1 - c;
-  const real length = std::sqrt(static_cast<real>(x * x + z * z));
-  const real ax = length != 0 ? -z / length : 1, az = length != 0 ? x / length : 0;
-  const real base[3][3] = {
-      {ax * ax * t + c, az * s, az * ax * t}, {-az * s, c, ax * s}, {az * ax * t, -ax * s, az * az * t + c}};
+  wrap = scale[2] / 1024;
+  float by[3] = {scale[0] / 1024, scale[1] / 1024, scale[2] / 1024};
+  if (type == 1) {
+    by[0] = scale[0] < 0 ? -scale[0] / 1024 : 1;
+    by[1] = 64 / scale[1];
+    by[2] = scale[0] > 0 ? scale[0] / 1024 : 1;
+  } else if (type == 2) {
+    for (int k = 0; k < 3; ++k) by[k] = 64 / scale[k];
+  }
+
+  const real c = static_cast<real>(p[1]) / 32767, s = -std::sqrt(1 - c * c), t = 1 - c;
+  const real length = std::sqrt(static_cast<real>(p[0] * p[0] + p[2] * p[2]));
+  const real ax = length != 0 ? -p[2] / length : 1, az = length != 0 ? p[0] / length : 0;
+  const Real3 x = {ax * ax * t + c, az * s, az * ax * t}, y = {-az * s, c, ax * s};
+  const Real3 z = {az * ax * t, -ax * s, az * az * t + c};
   const auto angle = static_cast<unsigned int>((*mesh.mappingrotation)[m] * 64);
   const real co = mymath::cos(angle), si = mymath::sin(angle);
-  for (int k = 0; k < 3; ++k) {
-    rows[0][k] = static_cast<float>((co * base[0][k] + si * base[2][k]) * scale[0]);
-    rows[1][k] = static_cast<float>(base[1][k] * scale[1]);
-    rows[2][k] = static_cast<float>((-si * base[0][k] + co * base[2][k]) * scale[2]);
-  }
+  const auto row = [](real a, Real3 u, real b, Real3 v, float factor) {
+    return Real3{single((a * u.x + b * v.x) * factor), single((a * u.y + b * v.y) * factor),
+                 single((a * u.z + b * v.z) * factor)};
+  };
+  rows[0] = row(co, x, si, z, by[0]);
+  rows[1] = row(1, y, 0, z, by[1]);
+  rows[2] = row(-si, x, co, z, by[2]);
 }
 
-int cube_face(real x, real y, real z) {
+int cube_face(float x, float y, float z) {
   if (std::abs(y) > std::abs(x) && std::abs(y) > std::abs(z)) return y > 0 ? 0 : 1;
   if (std::abs(z) > std::abs(x) && std::abs(z) > std::abs(y)) return z > 0 ? 2 : 3;
   return x > 0 ? 4 : 5;
+}
+
+// The coordinates of the corners of a face in repeats of the texture; centre: of all faces of the mapping.
+void map_onto(const Mapping& m, const Real3 (&corner)[3], Real3 centre, float (&u)[3], float (&v)[3]) {
+  // All corners of a cube's face are seen from the side that the face shows.
+  const Real3 n = cross(corner[1] - corner[0], corner[2] - corner[0]);
+  const auto unscaled = [&](int axis) { return static_cast<float>(m.along(axis, n) / (64 / m.scale[axis])); };
+  const int side = cube_face(unscaled(0), unscaled(1), unscaled(2));
+  const real* const shift = m.translate;
+  for (int k = 0; k < 3; ++k) {
+    const Real3 d = corner[k] - centre;
+    const real x = m.along(0, d), y = m.along(1, d), z = m.along(2, d);
+    const real turns = single(std::atan2(single(x), single(z))) / 6.2831855f + 0.5L;
+    real s, t;
+    if (m.type == 1) {
+      s = turns * m.wrap;
+      t = y + 0.5L + shift[0];
+    } else if (m.type == 2) {
+      const real us[6] = {x + shift[0], x + shift[0], shift[0] - x, x + shift[0], z + shift[2], shift[2] - z};
+      const real vs[6] = {shift[2] - z, z + shift[2], shift[1] - y, shift[1] - y, shift[1] - y, shift[1] - y};
+      s = us[side] + 0.5L;
+      t = vs[side] + 0.5L;
+    } else {
+      s = turns;
+      t = single(std::asin(single(y / std::sqrt(x * x + y * y + z * z)))) / 3.1415927f + 0.5L + shift[0];
+    }
+    // Floats from here on: opposite corners lie half a period apart, and the last bit decides. A quarter turn each.
+    u[k] = static_cast<float>(s), v[k] = static_cast<float>(t);
+    for (int turn = 0; turn < m.direction && m.direction < 4; ++turn) {
+      std::swap(u[k], v[k]);
+      u[k] = -u[k];
+    }
+  }
+  if (m.type == 2) return;
+  // Corners beyond the seam come to the first one's side.
+  const float period = m.type == 1 ? m.wrap : 1;
+  float* const round = (m.direction & 1) != 0 ? v : u;
+  for (int k = 1; k < 3; ++k) {
+    if (round[k] - round[0] > period / 2) {
+      round[k] -= period;
+    } else if (round[0] - round[k] > period / 2) {
+      round[k] += period;
+    }
+  }
 }
 
 // --- Light ----------------------------------------------------------------------------------------------------------
@@ -101,36 +151,26 @@ unsigned int sunlit(unsigned int rgb, const Vector4_s& n, float factor) {
   const float d = (k.sun_x * n.x + k.sun_y * n.y + k.sun_z * n.z) / n.w;
   const float t = k.ambient + d * (d > 0 ? k.sun_front : k.sun_back) * factor;
   const int intensity = truncate(t * 256);
-  unsigned int result = 0xFF000000;
-  for (const auto& [shift, sun] : {std::pair(16, k.sun_r), std::pair(8, k.sun_g), std::pair(0, k.sun_b)}) {
-    const std::int64_t channel = static_cast<int>((rgb >> shift & 0xFF) * sun >> 8);
-    const std::int64_t lit = channel * intensity >> 8;
-    result |= static_cast<unsigned int>(std::clamp<std::int64_t>(lit, 4, 252)) << shift;
-  }
-  return result;
+  const unsigned int sun[4] = {k.sun_b, k.sun_g, k.sun_r, 0};
+  return 0xFF000000 | word_of([&](int c) {
+           const auto lit = static_cast<std::int64_t>(channel(rgb, c) * sun[c] >> 8) * intensity >> 8;
+           return c == 3 ? 255 : std::clamp<std::int64_t>(lit, 4, 252);
+         });
 }
 
 unsigned int pointlit(unsigned int rgb, const Vector4_s& at, const Vector4_s& n, const Vector4_s (&lights)[4]) {
   const toolkit& k = kit();
-  float sum[4];
-  for (int c = 0; c < 4; ++c) sum[c] = static_cast<float>(rgb >> 8 * c & 0xFF);
-  for (int i = 0; i < k.pointlight_count; ++i) {
-    const float dx = lights[i].x - at.x, dy = lights[i].y - at.y, dz = lights[i].z - at.z;
-    const float s = dx * dx + dy * dy + dz * dz;
-    const float towards = dx * n.x + dy * n.y + dz * n.z;
-    const float r = _mm_cvtss_f32(_mm_rcp_ss(_mm_set_ss(s))), q = _mm_cvtss_f32(_mm_rsqrt_ss(_mm_set_ss(s)));
-    const float e = (towards > 0 ? towards : 0) * k.pointlight_strength[i] * r * q;
-    for (int c = 0; c < 4; ++c) {
-      const auto own = static_cast<float>(rgb >> 8 * c & 0xFF);
-      const auto light = static_cast<float>(k.pointlight_colour[i] >> 8 * c & 0xFF);
-      sum[c] += light * (1.5259022e-5f * own) * e;
+  return word_of([&](int c) {
+    const auto own = static_cast<float>(channel(rgb, c));
+    float sum = own;
+    for (int i = 0; i < k.pointlight_count; ++i) {
+      const float dx = lights[i].x - at.x, dy = lights[i].y - at.y, dz = lights[i].z - at.z;
+      const float s = dx * dx + dy * dy + dz * dz, towards = dx * n.x + dy * n.y + dz * n.z;
+      const float e = (towards > 0 ? towards : 0) * k.pointlight_strength[i] * reciprocal(s) * reciprocal_root(s);
+      sum += static_cast<float>(channel(k.pointlight_colour[i], c)) * (1.5259022e-5f * own) * e;
     }
-  }
-  unsigned int result = 0;
-  for (int c = 0; c < 4; ++c) {
-    result |= static_cast<unsigned int>(std::clamp(word(round_to_nearest(sum[c])), 0, 255)) << 8 * c;
-  }
-  return result;
+    return std::clamp(signed_word(round_to_nearest(sum)), 0, 255);
+  });
 }
 
 // --- Projection -----------------------------------------------------------------------------------------------------
@@ -140,8 +180,8 @@ Matrix_c product(const Matrix_c& a, const Matrix_c& b) {
   for (int i = 0; i < 4; ++i) {
     const Vector4_s& l = a.rows[i];
     for (int j = 0; j < 4; ++j) {
-      (&m.rows[i].x)[j] =
-          (l.x * lane(b.rows[0], j) + l.z * lane(b.rows[2], j)) + (l.y * lane(b.rows[1], j) + l.w * lane(b.rows[3], j));
+      const auto column = [&](int k) { return lane(b.rows[k], j); };
+      lane(m.rows[i], j) = (l.x * column(0) + l.z * column(2)) + (l.y * column(1) + l.w * column(3));
     }
   }
   return m;
@@ -150,7 +190,7 @@ Matrix_c product(const Matrix_c& a, const Matrix_c& b) {
 Vector4_s transform(const Vector4_s& p, const Matrix_c& m) {
   Vector4_s r;
   for (int j = 0; j < 4; ++j) {
-    (&r.x)[j] = p.x * lane(m.rows[0], j) + p.y * lane(m.rows[1], j) + p.z * lane(m.rows[2], j) + lane(m.rows[3], j);
+    lane(r, j) = p.x * lane(m.rows[0], j) + p.y * lane(m.rows[1], j) + p.z * lane(m.rows[2], j) + lane(m.rows[3], j);
   }
   return r;
 }
@@ -161,22 +201,24 @@ Vector4_s to_screen(const Vector4_s& p, const Matrix_c& m) {
   for (int j = 0; j < 4; ++j) {
     float divided = lane(clip, j) / clip.w;
     if (j == 2 && std::signbit(clip.z)) divided = -std::abs(divided);
-    (&s.x)[j] = divided * lane(m_ViewportMul, j) + lane(m_ViewportAdd, j);
+    lane(s, j) = divided * lane(m_ViewportMul, j) + lane(m_ViewportAdd, j);
   }
   return s;
 }
 
-bool visible(const Vector4_s& p0, const Vector4_s& p1, const Vector4_s& p2) {
+// Neither all beyond one side, nor all nearer than the nearest, nor seen from behind.
+bool visible(const Vector4_s (&p)[3]) {
   unsigned int common = 0xFF;
-  for (const Vector4_s* p : {&p0, &p1, &p2}) {
-    const int lanes[4] = {truncate(p->x), truncate(p->y), truncate(p->z * 32767), truncate(p->z * 32767)};
+  for (const Vector4_s& at : p) {
+    const int lanes[4] = {truncate(at.x), truncate(at.y), truncate(at.z * 32767), truncate(at.z * 32767)};
     unsigned int flags = 0;
     for (int i = 0; i < 4; ++i) {
-      flags |= (word(lanes[i]) > m_TriangleCuller.lanes[i] ? 1u : 0u) << i | (word(lanes[i]) < 0 ? 16u : 0u) << i;
+      const int word = signed_word(lanes[i]);
+      flags |= (word > m_TriangleCuller.lanes[i] ? 1u : 0u) << i | (word < 0 ? 16u : 0u) << i;
     }
     common &= flags;
   }
-  return common == 8 && (p2.x - p0.x) * (p1.y - p0.y) > (p2.y - p0.y) * (p1.x - p0.x);
+  return common == 8 && (p[2].x - p[0].x) * (p[1].y - p[0].y) > (p[2].y - p[0].y) * (p[1].x - p[0].x);
 }
 
 }  // namespace
@@ -188,13 +230,11 @@ Model::Model(const Mesh& mesh)
       flags(static_cast<unsigned int>(mesh.flags)),
       ambient(mesh.ambient),
       contrast(mesh.contrast),
-      vertexcount(mesh.vertexcount),
       meshvertexcount(mesh.meshvertexcount) {
-  for (int i = 0; i < vertexcount; ++i) {
-    const auto f = [i](const Mesh::ints& v) { return static_cast<float>((*v)[i]); };
-    vpos.push_back({f(mesh.x), f(mesh.y), f(mesh.z), 0});
+  for (int i = 0; i < mesh.vertexcount; ++i) {
+    const auto at = [&](int axis) { return static_cast<float>((*mesh.position[axis])[i]); };
+    vpos.push_back({at(0), at(1), at(2), 0});
   }
-  copy(vmask, mesh.vmask);
 
   // Faces: textured ones first, then the others, then carriers of billboards that would have gone.
   constexpr int gone = -1;
@@ -203,8 +243,7 @@ Model::Model(const Mesh& mesh)
   for (int i = 0; i < inputs; ++i) {
     if (mesh.ftype && (*mesh.ftype)[i] == 2) continue;
     const texturemetrics* const texture = mesh.ftex ? metrics((*mesh.ftex)[i]) : nullptr;
-    const bool flat = texture != nullptr && (flags & 0x40) != 0 && texture->flat_colour;
-    if (texture == nullptr || flat) {
+    if (texture == nullptr || ((flags & 0x40) != 0 && texture->flat_colour)) {
       plain.push_back(i);
     } else if (!texture->do_not_draw) {
       number[i] = texfacecount++;
@@ -231,8 +270,9 @@ Model::Model(const Mesh& mesh)
       if (number[i] != gone) out[number[i]] = static_cast<std::decay_t<decltype(out[0])>>((*in)[i]);
     }
   };
-  take(fa, mesh.a), take(fb, mesh.b), take(fc, mesh.c), take(fhsl, mesh.fhsl);
-  take(fpriority, mesh.fpriority), take(ftype, mesh.ftype), take(falpha, mesh.falpha), take(fmask, mesh.fmask);
+  for (int k = 0; k < 3; ++k) take(corner[k], mesh.corner[k]);
+  take(fhsl, mesh.fhsl), take(fpriority, mesh.fpriority), take(ftype, mesh.ftype);
+  take(falpha, mesh.falpha), take(fmask, mesh.fmask);
   hasalpha = mesh.falpha.has_value();
   for (int i = 0; i < inputs && mesh.ftex; ++i) {
     const texturemetrics* const texture = metrics((*mesh.ftex)[i]);
@@ -243,135 +283,71 @@ Model::Model(const Mesh& mesh)
   if (mesh.ftex && texfacecount > 0) texture_coordinates(mesh, number);
 
   // Labels.
-  const auto count = [](const auto& v) { return v ? static_cast<int>(v->size()) : 0; };
-  std::vector<int> members(std::max(vertexcount, std::max(billboardcount, 1)));
-  for (int i = 0; i < static_cast<int>(members.size()); ++i) members[i] = i;
-  const int labels = count(mesh.facelabels);
-  if ((functionmask & 0x400) != 0 && mesh.billboarddata && labels > 0) {
-    bblabels = group(billboardcount, {mesh.facelabels->end() - billboardcount, mesh.facelabels->end()}, members);
+  if (mesh.vmask) vmask.assign(mesh.vmask->begin(), mesh.vmask->end());
+  if (mesh.pslist) pslist = *mesh.pslist;
+  const auto labelled = [this](unsigned int mask, const Mesh::ints& list) {
+    return (functionmask & mask) != 0 && list && !list->empty();
+  };
+  std::vector<int> all(std::max(mesh.vertexcount, billboardcount));
+  for (int i = 0; i < static_cast<int>(all.size()); ++i) all[i] = i;
+  if (mesh.billboarddata && labelled(0x400, mesh.facelabels)) {
+    bblabels = group({mesh.facelabels->end() - billboardcount, mesh.facelabels->end()}, all);
   }
-  if ((functionmask & 0x180) != 0 && labels > 0) {
-    std::vector<int> mapped = number;
-    mapped.resize(labels, gone);
-    flabels = group(labels, *mesh.facelabels, mapped);
+  if (labelled(0x180, mesh.facelabels)) {
+    number.resize(mesh.facelabels->size(), gone);
+    flabels = group(*mesh.facelabels, number);
   }
-  if ((functionmask & 0x20) != 0 && count(mesh.vertexlabels) > 0) {
-    vlabels = group(vertexcount, *mesh.vertexlabels, members);
-  }
-  copy(pslist, mesh.pslist);
+  if (labelled(0x20, mesh.vertexlabels)) vlabels = group(*mesh.vertexlabels, all);
 
   // A carrier shrinks to its centre, with whatever hangs on its corners.
   for (const Billboard& b : billboards) {
-    Vector4_s *const p = &vpos[fa[b.face]], *const q = &vpos[fb[b.face]], *const r = &vpos[fc[b.face]];
+    Vector4_s *const p = &vpos[corner[0][b.face]], *const q = &vpos[corner[1][b.face]];
+    Vector4_s* const r = &vpos[corner[2][b.face]];
     constexpr float third = 0.33333334f;
-    const Vector4_s mean = {(p->x + q->x + r->x) * third, (p->y + q->y + r->y) * third, (p->z + q->z + r->z) * third,
-                            0};
-    *p = *q = *r = mean;
-    fa[b.face] = fb[b.face] = fc[b.face];
+    *p = *q = *r = {(p->x + q->x + r->x) * third, (p->y + q->y + r->y) * third, (p->z + q->z + r->z) * third, 0};
+    corner[0][b.face] = corner[1][b.face] = corner[2][b.face];
   }
 }
 
 void Model::texture_coordinates(const Mesh& mesh, const std::vector<int>& number) {
   ftex.resize(texfacecount);
-  for (auto& corner : fuv) corner.resize(texfacecount);
+  for (auto& coordinates : fuv) coordinates.resize(texfacecount);
+  const auto at = [&](int i, int k) { return vpos[(*mesh.corner[k])[i]]; };
+  const auto mapping_of = [&](int i) { return mesh.fmapping ? static_cast<unsigned char>((*mesh.fmapping)[i]) : -1; };
 
-  const int mappings = mesh.fmapping ? mesh.mappingcount : 0;
-  std::vector<Vector4_s> low(mappings, {2e9f, 2e9f, 2e9f, 0}), high(mappings, {-2e9f, -2e9f, -2e9f, 0});
-  const auto corner = [&](int i, int k) { return vpos[(*(k == 0 ? mesh.a : k == 1 ? mesh.b : mesh.c))[i]]; };
+  std::vector<Vector4_s> least(256, {2e9f, 2e9f, 2e9f, 0}), most(256, {-2e9f, -2e9f, -2e9f, 0});
   for (int i = 0; i < mesh.inputfacecount && mesh.fmapping; ++i) {
-    const int m = static_cast<unsigned char>((*mesh.fmapping)[i]);
-    for (int k = 0; k < 3 && m < 255; ++k) {
-      const Vector4_s p = corner(i, k);
-      low[m] = {std::min(low[m].x, p.x), std::min(low[m].y, p.y), std::min(low[m].z, p.z), 0};
-      high[m] = {std::max(high[m].x, p.x), std::max(high[m].y, p.y), std::max(high[m].z, p.z), 0};
+    for (int k = 0; k < 3; ++k) {
+      for (int axis = 0; axis < 3; ++axis) {
+        float &from = lane(least[mapping_of(i)], axis), &to = lane(most[mapping_of(i)], axis);
+        from = std::min(from, lane(at(i, k), axis));
+        to = std::max(to, lane(at(i, k), axis));
+      }
     }
   }
   for (int i = 0; i < mesh.inputfacecount; ++i) {
-    const int e = number[i];
+    const int e = number[i], m = mapping_of(i);
     if (e < 0 || e >= texfacecount) continue;
     ftex[e] = static_cast<unsigned short>((*mesh.ftex)[i]);
-    const int m = mesh.fmapping ? static_cast<unsigned char>((*mesh.fmapping)[i]) : -1;
     if (m < 0 || m == 255) {
       const float side = m < 0 ? 127 : 128;
       fuv[0][e] = {0, side}, fuv[1][e] = {side, side}, fuv[2][e] = {0, 0};
       continue;
     }
+    const Real3 corners[3] = {point(at(i, 0)), point(at(i, 1)), point(at(i, 2))};
     float u[3], v[3];
-    const int type = (*mesh.mappingtype)[m];
-    if (type == 0) {
-      const Real3 origin = point(vpos[(*mesh.mappingp)[m]]);
-      const Real3 along = point(vpos[(*mesh.mappingm)[m]]) - origin, down = point(vpos[(*mesh.mappingn)[m]]) - origin;
+    if ((*mesh.mappingtype)[m] == 0) {
+      const auto spanning = [&](int k) { return point(vpos[(*mesh.mappingaxis[k])[m]]); };
+      const Real3 origin = spanning(0), along = spanning(1) - origin, down = spanning(2) - origin;
       const Real3 w = cross(along, down), q = cross(down, w), r = cross(along, w);
       for (int k = 0; k < 3; ++k) {
-        const Real3 d = point(corner(i, k)) - origin;
-        u[k] = static_cast<float>(dot(d, q) / dot(along, q));
-        v[k] = static_cast<float>(dot(d, r) / dot(down, r));
+        u[k] = static_cast<float>(dot(corners[k] - origin, q) / dot(along, q));
+        v[k] = static_cast<float>(dot(corners[k] - origin, r) / dot(down, r));
       }
     } else {
-      real rows[3][3];
-      mapping_matrix(mesh, m, rows);
-      const Real3 centre = {(low[m].x + high[m].x) * 0.5f, (low[m].y + high[m].y) * 0.5f,
-                            (low[m].z + high[m].z) * 0.5f};
-      const auto turned = [&](Real3 d, int row) { return dot({rows[row][0], rows[row][1], rows[row][2]}, d); };
-      const auto shift = [m](const Mesh::ints& t) { return static_cast<real>((*t)[m]) / 256; };
-      const real tu = shift(mesh.mappingtranslatex);
-      const float wrap = static_cast<float>((*mesh.mappingscalez)[m]) / 1024;
-      const real pi = 3.1415927f, two_pi = 6.2831855f;
-
-      // All corners of a cube's face are seen from the side that the face shows.
-      const Real3 n = cross(point(corner(i, 1)) - point(corner(i, 0)), point(corner(i, 2)) - point(corner(i, 0)));
-      const auto unscaled = [&](int row, const Mesh::ints& scale) {
-        return turned(n, row) / (64 / static_cast<float>((*scale)[m]));
-      };
-      const int side =
-          cube_face(unscaled(0, mesh.mappingscalex), unscaled(1, mesh.mappingscaley), unscaled(2, mesh.mappingscalez));
-      for (int k = 0; k < 3; ++k) {
-        const Real3 d = point(corner(i, k)) - centre;
-        const real q0 = turned(d, 0), q1 = turned(d, 1), q2 = turned(d, 2);
-        const real turns = single(std::atan2(single(q0), single(q2))) / two_pi + 0.5L;
-        real s, t;
-        if (type == 1) {
-          s = turns * wrap;
-          t = q1 + 0.5L + tu;
-        } else if (type == 2) {
-          const real tv = shift(mesh.mappingtranslatey), tw = shift(mesh.mappingtranslatez);
-          const real us[6] = {q0 + tu, q0 + tu, tu - q0, q0 + tu, q2 + tw, tw - q2};
-          const real vs[6] = {tw - q2, q2 + tw, tv - q1, tv - q1, tv - q1, tv - q1};
-          s = us[side] + 0.5L;
-          t = vs[side] + 0.5L;
-        } else {
-          const real length = std::sqrt(q0 * q0 + q1 * q1 + q2 * q2);
-          s = turns;
-          t = single(std::asin(single(q1 / length))) / pi + 0.5L + tu;
-        }
-        // Floats from here on: opposite corners lie half a period apart, and the last bit decides.
-        u[k] = static_cast<float>(s), v[k] = static_cast<float>(t);
-        const float u0 = u[k], v0 = v[k];
-        switch ((*mesh.mappingdirection)[m]) {
-          case 1:
-            u[k] = -v0, v[k] = u0;
-            break;
-          case 2:
-            u[k] = -u0, v[k] = -v0;
-            break;
-          case 3:
-            u[k] = v0, v[k] = -u0;
-            break;
-          default:
-            break;
-        }
-      }
-      if (type != 2) {
-        const float period = type == 1 ? wrap : 1;
-        float* const x = ((*mesh.mappingdirection)[m] & 1) != 0 ? v : u;
-        for (int k = 1; k < 3; ++k) {
-          if (x[k] - x[0] > period / 2) {
-            x[k] -= period;
-          } else if (x[0] - x[k] > period / 2) {
-            x[k] += period;
-          }
-        }
-      }
+      const Real3 centre = {(least[m].x + most[m].x) * 0.5f, (least[m].y + most[m].y) * 0.5f,
+                            (least[m].z + most[m].z) * 0.5f};
+      map_onto(Mapping(mesh, m), corners, centre, u, v);
     }
     for (int k = 0; k < 3; ++k) fuv[k][e] = {u[k] * 128, v[k] * 128};
   }
@@ -388,19 +364,15 @@ void Model::update_mask(unsigned int mask) {
 }
 
 void Model::bounds() {
-  float low[3] = {32767, 32767, 32767}, high[3] = {-32768, -32768, -32768}, cylinder = 0, sphere = 0;
+  float least[3] = {32767, 32767, 32767}, most[3] = {-32768, -32768, -32768}, cylinder = 0, sphere = 0;
   for (int i = 0; i < meshvertexcount; ++i) {
     const Vector4_s& p = vpos[i];
-    for (int k = 0; k < 3; ++k) {
-      low[k] = std::min(low[k], lane(p, k));
-      high[k] = std::max(high[k], lane(p, k));
-    }
+    for (int k = 0; k < 3; ++k) least[k] = std::min(least[k], lane(p, k)), most[k] = std::max(most[k], lane(p, k));
     cylinder = std::max(cylinder, p.x * p.x + p.z * p.z);
     sphere = std::max(sphere, p.x * p.x + p.y * p.y + p.z * p.z);
   }
   const auto bound = [](float f) { return static_cast<int>(static_cast<short>(truncate(f))); };
-  minx = bound(low[0]), miny = bound(low[1]), minz = bound(low[2]);
-  maxx = bound(high[0]), maxy = bound(high[1]), maxz = bound(high[2]);
+  for (int k = 0; k < 3; ++k) low[k] = bound(least[k]), high[k] = bound(most[k]);
   radiuscylinder = bound(std::sqrt(cylinder) + 0.99f);
   radiussphere = bound(std::sqrt(sphere) + 0.99f);
   boundsvalid = true;
@@ -410,17 +382,14 @@ void Model::calculate_normals() {
   vnormal.assign(meshvertexcount, {});
   fnormal.assign(facecount, {});
   for (int f = 0; f < facecount; ++f) {
-    const Real3 a = point(vpos[fa[f]]);
-    Real3 n = cross(point(vpos[fb[f]]) - a, point(vpos[fc[f]]) - a);
+    const Real3 a = point(vpos[corner[0][f]]);
+    Real3 n = cross(point(vpos[corner[1][f]]) - a, point(vpos[corner[2][f]]) - a);
     const real length = std::sqrt(dot(n, n));
     if (length != 0) n = {n.x / length, n.y / length, n.z / length};
     const Vector4_s unit = {static_cast<float>(n.x), static_cast<float>(n.y), static_cast<float>(n.z), 1};
-    if (!ftype.empty() && ftype[f] != 0) {
-      if (ftype[f] == 1) fnormal[f] = unit;
-      continue;
-    }
-    for (int v : {fa[f], fb[f], fc[f]}) {
-      for (int k = 0; k < 4; ++k) (&vnormal[v].x)[k] += lane(unit, k);
+    if (type(f) == 1) fnormal[f] = unit;
+    for (int k = 0; k < 3 && type(f) == 0; ++k) {
+      for (int i = 0; i < 4; ++i) lane(vnormal[corner[k][f]], i) += lane(unit, i);
     }
   }
   for (Vector4_s& n : vnormal) {
@@ -431,27 +400,25 @@ void Model::calculate_normals() {
 unsigned int Model::unlit(unsigned int hsl, unsigned short texture) const {
   const auto level = static_cast<unsigned int>(ambient);
   const unsigned int scaled = (hsl & 127) * level >> 7;
-  unsigned int rgb = colourutils::hsl_2_rgb((hsl & 0xFF80) + (scaled > 1 ? std::min(scaled, 126u) : 2));
+  const unsigned int rgb = colourutils::hsl_2_rgb((hsl & 0xFF80) + (scaled > 1 ? std::min(scaled, 126u) : 2));
   if (texture == 65535) return rgb;
   const texturemetrics& m = *kit().textures->getmetrics(texture);
-  for (int shift = 0; shift < 24; shift += 8) {
-    unsigned int c = rgb >> shift & 0xFF;
+  return word_of([&](int i) {
+    unsigned int c = channel(rgb, i);
     const unsigned int grey = level < 128 ? level * 2 : 255;
     if (m.grey_blend != 0) c = (grey * m.grey_blend + c * (256u - m.grey_blend)) >> 8;
     if (m.brighten != 0) c = std::min(c * (m.brighten + 256u), 65535u) >> 8;
-    rgb = (rgb & ~(0xFFu << shift)) | c << shift;
-  }
-  return rgb;
+    return c;
+  });
 }
 
 void Model::light() {
   if (vnormal.empty()) calculate_normals();
   fcolours.resize(3 * facecount);
   for (int f = 0; f < facecount; ++f) {
-    if (!ftype.empty() && ftype[f] > 1) continue;
+    if (type(f) > 1) continue;
     const unsigned int rgb = unlit(fhsl[f], f < texfacecount ? ftex[f] : 65535);
-    const unsigned int alpha = falpha.empty() ? 255 : 255u - falpha[f];
-    std::fill_n(&fcolours[3 * f], 3, alpha << 24 | (rgb & 0xFFFFFF));
+    std::fill_n(&fcolours[3 * f], 3, (255 - transparency(f)) << 24 | (rgb & 0xFFFFFF));
   }
   if ((functionmask & 0x97298) == 0) fhsl.clear();
 }
@@ -459,25 +426,24 @@ void Model::light() {
 // --- Drawing --------------------------------------------------------------------------------------------------------
 
 int Model::render(const Matrix_c& world, int* result) {
-  toolkit& k = kit();
+  const toolkit& k = kit();
   if (facecount == 0 || (m_pColourBuffer == nullptr && m_pDepthBuffer == nullptr)) return -1;
   const Matrix_c mvp = product(world, k.viewprojection);
   if (!boundsvalid) bounds();
-  const Vector4_s low = {0, static_cast<float>(miny), 0, 1}, high = {0, static_cast<float>(maxy), 0, 1};
-  const Vector4_s w0 = transform(low, world), w1 = transform(high, world);
+  const Vector4_s bottom = {0, static_cast<float>(low[1]), 0, 1}, top = {0, static_cast<float>(high[1]), 0, 1};
+  const Vector4_s w0 = transform(bottom, world), w1 = transform(top, world);
+  const auto radius = static_cast<float>(radiuscylinder);
   for (const Vector4_s& plane : k.frustum) {
-    const auto side = [&plane](const Vector4_s& p) {
-      return plane.x * p.x + plane.y * p.y + plane.z * p.z + plane.w * p.w;
+    const auto beyond = [&](const Vector4_s& p) {
+      return -radius > plane.x * p.x + plane.y * p.y + plane.z * p.z + plane.w * p.w;
     };
-    const auto r = static_cast<float>(-radiuscylinder);
-    if (r > side(w0) && r > side(w1)) return -1;
+    if (beyond(w0) && beyond(w1)) return -1;
   }
-  const Vector4_s s0 = to_screen(low, mvp), s1 = to_screen(high, mvp);
+  const Vector4_s s0 = to_screen(bottom, mvp), s1 = to_screen(top, mvp);
   if (result != nullptr) {
     Vector4_s end = w0.z > w1.z ? w0 : w1;
     const float middle = to_screen(end, k.viewprojection).x;
-    const auto radius = static_cast<float>(radiuscylinder);
-    end.x += radius * k.camera.rows[0].x, end.y += radius * k.camera.rows[1].x, end.z += radius * k.camera.rows[2].x;
+    for (int i = 0; i < 3; ++i) lane(end, i) += radius * k.camera.rows[i].x;
     const int across = round_to_nearest(to_screen(end, k.viewprojection).x - middle);
     const int values[6] = {truncate(s0.x), truncate(s0.y), truncate(s1.x), truncate(s1.y), std::abs(across), 1};
     std::copy_n(values, 6, result);
@@ -486,93 +452,22 @@ int Model::render(const Matrix_c& world, int* result) {
   if (vnormal.empty()) calculate_normals();
   Vector4_s lights[4] = {};
   for (int i = 0; i < k.pointlight_count; ++i) {
-    const Vector4_s& from = k.pointlight_pos[i];
-    const Vector4_s& origin = world.rows[3];
-    const Vector4_s d = {from.x - origin.x, from.y - origin.y, from.z - origin.z, 0};
-    const auto along = [&](int row) {
-      const Vector4_s& axis = world.rows[row];
-      return d.x * axis.x + d.y * axis.y + d.z * axis.z;
-    };
-    lights[i] = {along(0), along(1), along(2), 0};
+    const Vector4_s &from = k.pointlight_pos[i], &origin = world.rows[3];
+    const float x = from.x - origin.x, y = from.y - origin.y, z = from.z - origin.z;
+    for (int j = 0; j < 3; ++j) lane(lights[i], j) = x * world.rows[j].x + y * world.rows[j].y + z * world.rows[j].z;
   }
   const int variant = ((flags & 0x10) != 0 && k.pointlight_count > 0 ? 1 : 0) |
                       (k.fog_start > 0 && std::max(s0.z, s1.z) > m_DistanceFogStart ? 2 : 0) | (k.underwater ? 4 : 0) |
                       (m_pColourBuffer != nullptr ? 8 : 0) | (m_pDepthBuffer != nullptr ? 16 : 0);
-  draw(variant, world, mvp, lights);
-  return variant;
-}
 
-void Model::draw(int variant, const Matrix_c& world, const Matrix_c& mvp, const Vector4_s (&lights)[4]) {
-  toolkit& k = kit();
-  const bool point_lights = (variant & 1) != 0, height_fog = (variant & 4) != 0;
-  const bool colour = (variant & 8) != 0, depth = (variant & 16) != 0;
-  const int fog = ((variant & 2) != 0 ? 2 : 0) + (height_fog ? 1 : 0);
-
-  const auto gettex = [&](int f) -> const cachedtexture* {
-    return f < texfacecount ? k.textures->gettex(ftex[f]) : nullptr;
-  };
-  const auto transparency = [this](int f) { return falpha.empty() ? 0u : falpha[f]; };
-
-  const auto face = [&](int f) {
-    const int v[3] = {fa[f], fb[f], fc[f]};
-    Triangle_s t{};
-    for (int i = 0; i < 3; ++i) t.vertex[i] = to_screen(vpos[v[i]], mvp);
-    if (!visible(t.vertex[0], t.vertex[1], t.vertex[2])) return;
-    if (!colour) {
-      render_triangle({0, 0, false, 0, 0, false, false, true, false, true}, t);
-      return;
-    }
-    if (height_fog) {
-      for (int i = 0; i < 3; ++i) {
-        const Vector4_s& p = vpos[v[i]];
-        const float height = -(p.x * world.rows[0].y + p.y * world.rows[1].y + p.z * world.rows[2].y + world.rows[3].y);
-        const float factor = std::clamp((height - k.underwater_height_f) * k.underwater_scale, 0.0f, 1.0f);
-        if (factor == 1) return;
-        (&t.fogfactor.x)[i] = factor;
-      }
-      t.fogcolour = m_HeightFogColour;
-    }
-    const cachedtexture* const texture = gettex(f);
-    const int type = ftype.empty() ? 0 : ftype[f];
-    for (int i = 0; i < 3; ++i) {
-      unsigned int rgb = fcolours[3 * f + i];
-      if (type <= 1 && (texture == nullptr || texture->lighting_kind != 6)) {
-        const bool shared = !vsharednormal.empty() && vsharednormal[v[i]].w != 0;
-        const Vector4_s n = type == 1 ? fnormal[f] : shared ? vsharednormal[v[i]] : vnormal[v[i]];
-        rgb = sunlit(rgb, n, (type == 1 ? 512.0f : 768.0f) / static_cast<float>(contrast));
-        if (point_lights) rgb = pointlit(rgb, vpos[v[i]], n, lights);
-      }
-      t.colour[i] = vertex_colour(rgb);
-    }
-    const unsigned int alpha = transparency(f);
-    t.alpha = (255 - alpha) * 0x10001;
-    const int blend = alpha != 0 ? 3 : 0;
-    if (texture == nullptr) {
-      render_triangle({1, 0, false, fog, blend, false, false, alpha == 0, true, depth}, t);
-      return;
-    }
-    for (int i = 0; i < 3; ++i) {
-      t.texcoord[i] = {lane(texture->offset_u, 2 - i) + fuv[i][f].u, lane(texture->offset_v, 2 - i) + fuv[i][f].v, 0,
-                       0};
-    }
-    t.texture[0] = texture->texels;
-    if (alpha != 0 || texture->alpha_kind == 2) hasalpha = true;
-    const int address = texture->wrap_u || texture->wrap_v ? 1 : 2;
-    if (texture->alpha_kind == 2) {
-      render_triangle({2, address, false, fog, 2, false, false, !height_fog, true, depth}, t);
-    } else {
-      render_triangle({2, address, false, fog, blend, texture->alpha_kind == 1, false, true, true, depth}, t);
-    }
-  };
-
+  // With anything that blends: first what is opaque, then what is not.
   const bool two_passes = hasalpha;
   for (int pass = 0; pass < (two_passes ? 2 : 1); ++pass) {
     for (int f = 0; f < facecount; ++f) {
-      if (!ftype.empty() && ftype[f] == 2) continue;
+      if (type(f) == 2) continue;
       if (two_passes) {
         const unsigned int alpha = transparency(f);
-        if (alpha == 255) continue;
-        if (pass == 0 && alpha != 0) continue;
+        if (alpha == 255 || (pass == 0 && alpha != 0)) continue;
         bool translucent = alpha != 0;
         if (!translucent) {
           const cachedtexture* const texture = gettex(f);
@@ -580,8 +475,62 @@ void Model::draw(int variant, const Matrix_c& world, const Matrix_c& mvp, const 
         }
         if (translucent != (pass == 1)) continue;
       }
-      face(f);
+      draw(f, variant, world, mvp, lights);
     }
+  }
+  return variant;
+}
+
+const cachedtexture* Model::gettex(int f) const { return f < texfacecount ? kit().textures->gettex(ftex[f]) : nullptr; }
+
+void Model::draw(int f, int variant, const Matrix_c& world, const Matrix_c& mvp, const Vector4_s (&lights)[4]) {
+  const toolkit& k = kit();
+  const bool height_fog = (variant & 4) != 0, depth = (variant & 16) != 0;
+  const int fog = ((variant & 2) != 0 ? 2 : 0) + (height_fog ? 1 : 0);
+  Triangle_s t{};
+  for (int i = 0; i < 3; ++i) t.vertex[i] = to_screen(vpos[corner[i][f]], mvp);
+  if (!visible(t.vertex)) return;
+  if ((variant & 8) == 0) {
+    render_triangle({0, 0, false, 0, 0, false, false, true, false, true}, t);
+    return;
+  }
+  for (int i = 0; i < 3 && height_fog; ++i) {
+    const float height = -transform(vpos[corner[i][f]], world).y;
+    const float factor = std::clamp((height - k.underwater_height_f) * k.underwater_scale, 0.0f, 1.0f);
+    if (factor == 1) return;
+    lane(t.fogfactor, i) = factor;
+  }
+  t.fogcolour = m_HeightFogColour;
+
+  const cachedtexture* const texture = gettex(f);
+  for (int i = 0; i < 3; ++i) {
+    const int v = corner[i][f];
+    unsigned int rgb = fcolours[3 * f + i];
+    if (type(f) <= 1 && (texture == nullptr || texture->lighting_kind != 6)) {
+      const bool shared = !vsharednormal.empty() && vsharednormal[v].w != 0;
+      const Vector4_s n = type(f) == 1 ? fnormal[f] : shared ? vsharednormal[v] : vnormal[v];
+      rgb = sunlit(rgb, n, (type(f) == 1 ? 512.0f : 768.0f) / static_cast<float>(contrast));
+      if ((variant & 1) != 0) rgb = pointlit(rgb, vpos[v], n, lights);
+    }
+    t.colour[i] = vertex_colour(rgb);
+  }
+  const unsigned int alpha = transparency(f);
+  t.alpha = (255 - alpha) * 0x10001;
+  const int blend = alpha != 0 ? 3 : 0;
+  if (texture == nullptr) {
+    render_triangle({1, 0, false, fog, blend, false, false, alpha == 0, true, depth}, t);
+    return;
+  }
+  for (int i = 0; i < 3; ++i) {
+    t.texcoord[i] = {lane(texture->offset_u, 2 - i) + fuv[i][f].u, lane(texture->offset_v, 2 - i) + fuv[i][f].v, 0, 0};
+  }
+  t.texture[0] = texture->texels;
+  if (alpha != 0 || texture->alpha_kind == 2) hasalpha = true;
+  const int address = texture->wrap_u || texture->wrap_v ? 1 : 2;
+  if (texture->alpha_kind == 2) {
+    render_triangle({2, address, false, fog, 2, false, false, !height_fog, true, depth}, t);
+  } else {
+    render_triangle({2, address, false, fog, blend, texture->alpha_kind == 1, false, true, true, depth}, t);
   }
 }
 

@@ -8,6 +8,7 @@
 
 #include "maths/Matrix.h"
 #include "maths/Vector4.h"
+#include "texture/texturecache.h"
 
 namespace oracle {
 
@@ -20,10 +21,10 @@ struct Mesh {
   using bytes = array<std::int8_t>;
 
   int vertexcount = 0, meshvertexcount = 0;
-  ints x, y, z, vertexlabels;
+  ints position[3], vertexlabels;  // x, y, z
   shorts vmask;
   int inputfacecount = 0;
-  shorts a, b, c;
+  shorts corner[3];  // a, b, c
   bytes ftype, fpriority, falpha, fmapping;
   shorts fhsl, ftex;
   ints facelabels;
@@ -31,10 +32,10 @@ struct Mesh {
   shorts fmask;
   int mappingcount = 0;
   bytes mappingtype;
-  shorts mappingp, mappingm, mappingn;
-  ints mappingscalex, mappingscaley, mappingscalez;
+  shorts mappingaxis[3];  // p, m, n
+  ints mappingscale[3];   // x, y, z
   bytes mappingrotation, mappingdirection;
-  ints mappingtranslatex, mappingtranslatey, mappingtranslatez;
+  ints mappingtranslate[3];  // x, y, z
   ints pslist;
   int emittercount = 0, effectorcount = 0;
   int functionmask = 0, flags = 0, ambient = 128, contrast = 768;
@@ -70,9 +71,9 @@ struct Model {
   int render(const Matrix_c& world, int* result);
 
   unsigned int functionmask, flags;
-  int ambient, contrast, vertexcount, meshvertexcount, facecount = 0, texfacecount = 0;
+  int ambient, contrast, meshvertexcount, facecount = 0, texfacecount = 0;
   std::vector<Vector4_s> vpos, vnormal, vsharednormal, fnormal;
-  std::vector<unsigned short> vmask, fa, fb, fc, ftex, fhsl, fmask;
+  std::vector<unsigned short> vmask, corner[3], ftex, fhsl, fmask;
   std::vector<Coordinates> fuv[3];
   std::vector<unsigned char> ftype, fpriority, falpha;
   std::vector<unsigned int> fcolours;  // three a face; of faces that get no light, 0
@@ -80,12 +81,15 @@ struct Model {
   std::vector<Billboard> billboards;
   Labels vlabels, flabels, bblabels;
   bool hasalpha = false, hasanimatedtexture = false, boundsvalid = false;
-  int radiuscylinder = 0, radiussphere = 0, minx = 0, maxx = 0, miny = 0, maxy = 0, minz = 0, maxz = 0;
+  int radiuscylinder = 0, radiussphere = 0, low[3], high[3];
 
  private:
+  int type(int f) const { return ftype.empty() ? 0 : ftype[f]; }
+  unsigned int transparency(int f) const { return falpha.empty() ? 0 : falpha[f]; }
+  const cachedtexture* gettex(int f) const;
   void texture_coordinates(const Mesh& mesh, const std::vector<int>& number);
   unsigned int unlit(unsigned int hsl, unsigned short texture) const;
-  void draw(int variant, const Matrix_c& world, const Matrix_c& mvp, const Vector4_s (&lights)[4]);
+  void draw(int f, int variant, const Matrix_c& world, const Matrix_c& mvp, const Vector4_s (&lights)[4]);
 };
 
 }  // namespace oracle
