@@ -1,13 +1,11 @@
 // Drawn models against the slow reference, whole targets; then what happens around a draw.
 #include <algorithm>
-#include <bit>
-#include <cstdio>
 #include <set>
 
 #include "maths/Matrix.h"
 #include "model/mesh_fixture.h"
+#include "reference/comparison.h"
 #include "support/allocation_failure.h"
-#include "support/frame_record.h"
 #include "toolkit/threadresource.h"
 
 namespace {
@@ -49,37 +47,32 @@ class ModelRenderTest : public mesh_fixture {
                   r.one_in(5) ? r.real(-300, 1900) : r.real(200, 700));
   }
 
-  void random_target(test_random& r, bool with_colour, bool with_depth) {
+  void random_target(test_random& r, bool with_colour = true, bool with_depth = true) {
     make_target(width, height, with_colour, with_depth);
-    for (std::size_t i = 0; i < colour.elements(); ++i) colour.data()[i] = r.word();
-    for (std::size_t i = 0; i < depth.elements(); ++i) {
-      depth.data()[i] = r.one_in(3) ? r.real(0.7f, 1) : Rasterizer_n::far_depth;
+    std::generate_n(colour.data(), colour.elements(), [&r] { return r.word(); });
+    std::generate_n(depth.data(), depth.elements(),
+                    [&r] { return r.one_in(3) ? r.real(0.7f, 1) : Rasterizer_n::far_depth; });
+  }
+
+  // Invalidates what a draw computes, and shares some normals with a neighbour.
+  static void change_geometry(test_random& r, model& m, oracle::Model& o) {
+    m.geometrychanged();
+    m.vsharednormal = sharedarray<Vector4_s>::allocate(*m.pool, static_cast<unsigned>(m.meshvertexcount));
+    o.vnormal.clear(), o.fnormal.clear(), o.vsharednormal.clear(), o.boundsvalid = false;
+    for (int i = 0; i < m.meshvertexcount; ++i) {
+      const Vector4_s normal = {r.real(-2, 2), r.real(-2, 2), r.real(-2, 2), static_cast<float>(r.between(0, 3))};
+      o.vsharednormal.push_back(m.vsharednormal[i] = normal);
     }
   }
 };
-
-struct difference {
-  int pixels = 0, depths = 0;  // that are not the same
-  int most = 0;                // on any channel
-  void of(const std::vector<unsigned int>& a, const std::vector<unsigned int>& b) {
-    for (std::size_t i = 0; i < a.size(); ++i) {
-      pixels += a[i] != b[i];
-      for (int c = 0; c < 32; c += 8) {
-        most = std::max(most, std::abs(static_cast<int>(a[i] >> c & 0xFF) - static_cast<int>(b[i] >> c & 0xFF)));
-      }
-    }
-  }
-};
-
-}  // namespace
 
 // Bit for bit: the reference adds its floats in the library's order and asks the same processor for its estimates. A
 // library that adds in another order moves an edge by a pixel or a colour by a step, and this test will say so.
 TEST_F(ModelRenderTest, AllVariantsDrawTheReferencesFrames) {
   test_random r(3);
-  std::set<int> drawn, seen;
+  std::set<int> seen;
   int culled = 0;
-  std::uint64_t hash = 0;
+  std::vector<std::uint32_t> hashes;
   for (int n = 0; n < 700; ++n) {
     SCOPED_TRACE(n);
     const Mesh mesh = random_mesh(r, true);
@@ -87,26 +80,14 @@ TEST_F(ModelRenderTest, AllVariantsDrawTheReferencesFrames) {
     ASSERT_EQ(java.take_exception(), "");
     oracle::Model o(mesh);
     model& m = get(object);
-    const int target = r.between(1, 4);
-    for (int again = 0; again < 3; ++again) {
+    const bool with_colour = !r.one_in(4), with_depth = !with_colour || !r.one_in(3);
+    for (int again = 0; again < 3 && !HasFailure(); ++again) {
       random_state(r);
-      random_target(r, target != 1, target != 2);
-      auto slow_colour = guarded_image<unsigned int>(colour.width, colour.height);
-      auto slow_depth = guarded_image<float>(depth.width, depth.height);
-      std::copy_n(colour.data(), colour.elements(), slow_colour.data());
-      std::copy_n(depth.data(), depth.elements(), slow_depth.data());
-      const auto before = colour.copy();
-      const auto depth_before = depth.copy();
-      if (again == 2) {
-        // Normals that went are computed by the draw; some are shared with a neighbour.
-        m.geometrychanged();
-        m.vsharednormal = sharedarray<Vector4_s>::allocate(*m.pool, static_cast<unsigned>(m.meshvertexcount));
-        o.vnormal.clear(), o.fnormal.clear(), o.vsharednormal.clear(), o.boundsvalid = false;
-        for (int i = 0; i < m.meshvertexcount; ++i) {
-          const Vector4_s normal = {r.real(-2, 2), r.real(-2, 2), r.real(-2, 2), static_cast<float>(r.between(0, 3))};
-          o.vsharednormal.push_back(m.vsharednormal[i] = normal);
-        }
-      }
+      random_target(r, with_colour, with_depth);
+      const std::uint32_t blank_colour = hash_of(colour), blank_depth = hash_of(depth);
+      std::vector<unsigned int> slow_colour = colour.copy();
+      std::vector<float> slow_depth = depth.copy();
+      if (again == 2) change_geometry(r, m, o);
 
       const Numbers world = random_place(r);
       const jintArray result = again == 0 ? nullptr : java.new_ints(std::vector<jint>(7, -77));
@@ -115,42 +96,27 @@ TEST_F(ModelRenderTest, AllVariantsDrawTheReferencesFrames) {
       refused.clear();
       draw(object, world, result);
       ASSERT_EQ(java.take_exception(), "");
-      std::vector<int> asked;
-      asked.swap(refused);
+      const std::vector<int> asked = std::exchange(refused, {});
 
-      Rasterizer_n::m_pColourBuffer = target != 1 ? slow_colour.data() : nullptr;
-      Rasterizer_n::m_pDepthBuffer = target != 2 ? slow_depth.data() : nullptr;
+      Rasterizer_n::m_pColourBuffer = with_colour ? slow_colour.data() : nullptr;
+      Rasterizer_n::m_pDepthBuffer = with_depth ? slow_depth.data() : nullptr;
       const int variant = o.render(matrix(world), result != nullptr ? expected_result.data() : nullptr);
+      EXPECT_TRUE(same_image(colour, slow_colour.data())) << "colour, variant " << variant;
+      EXPECT_TRUE(same_image(depth, slow_depth.data())) << "depth, variant " << variant;
       EXPECT_EQ(refused, asked) << "other textures were asked for, or in another order";
-      ASSERT_EQ(model::modelcount - drawn_before, variant >= 0);
+      EXPECT_EQ(model::modelcount - drawn_before, variant >= 0);
       EXPECT_EQ(m.hasalpha, o.hasalpha);
       EXPECT_TRUE(result == nullptr || java.ints(result) == expected_result);
-      difference d;
-      d.of(colour.copy(), slow_colour.copy());
-      for (std::size_t i = 0; i < depth.elements(); ++i) {
-        const bool same = std::bit_cast<int>(depth.data()[i]) == std::bit_cast<int>(slow_depth.data()[i]);
-        if (!same) ++d.depths;
-      }
-      EXPECT_EQ(d.pixels, 0) << "most " << d.most << " variant " << variant;
-      EXPECT_EQ(d.depths, 0) << " variant " << variant;
-      if (variant < 0) {
-        ++culled;
-      } else {
-        drawn.insert(variant);
-        if (colour.copy() != before || depth.copy() != depth_before) seen.insert(variant);
-      }
-      hash = hash * 31 + frame_record::hash(colour.data(), 4 * colour.elements());
-      hash = hash * 31 + frame_record::hash(depth.data(), 4 * depth.elements());
-      if (HasFailure()) return;
+      culled += variant < 0;
+      if (hash_of(colour) != blank_colour || hash_of(depth) != blank_depth) seen.insert(variant);
+      hashes.insert(hashes.end(), {hash_of(colour), hash_of(depth)});
     }
+    if (HasFailure()) return;
     Java_h_ma(env, object);
   }
   EXPECT_GT(culled, 50);
-  // 16 with a colour target, and 8 of the depth alone: all of them left something in some frame.
-  EXPECT_EQ(drawn.size(), 24u);
-  EXPECT_EQ(seen, drawn);
-  const unsigned int words[] = {static_cast<unsigned>(hash), static_cast<unsigned>(hash >> 32)};
-  frame_record::add("models.all_variants", words, 2);
+  EXPECT_EQ(seen.size(), 24u) << "16 with a colour target, and 8 of the depth alone, leave something in some frame";
+  frame_record::add("models.all_variants", hashes.data(), hashes.size());
 }
 
 // A texture that is asked for in the middle of a draw: the client builds models and drops others before it answers,
@@ -161,10 +127,9 @@ TEST_F(ModelRenderTest, RequestsInsideADrawMayMoveAndCloseModels) {
     std::vector<unsigned int> frames[2];
     for (const bool disturbed : {true, false}) {
       test_random r(static_cast<std::uint64_t>(100 + round));
-      jobject other = build(random_mesh(r, true));
-      const jobject object = build(random_mesh(r, true));
+      const jobject other = build(random_mesh(r, true)), object = build(random_mesh(r, true));
       random_state(r);
-      random_target(r, true, true);
+      random_target(r);
       if (disturbed) {
         inside_request = [&] {
           ++requests;
@@ -173,8 +138,7 @@ TEST_F(ModelRenderTest, RequestsInsideADrawMayMoveAndCloseModels) {
           pool().defragment();
         };
       }
-      draw(object, placed(static_cast<float>(round), 0, 1, 0, 0, 350));
-      draw(object, placed(static_cast<float>(round), 0, 1, 0, 0, 350));
+      for (int i = 0; i < 2; ++i) draw(object, placed(static_cast<float>(round), 0, 1, 0, 0, 350));
       inside_request = nullptr;
       EXPECT_EQ(java.take_exception(), "");
       frames[disturbed] = colour.copy();
@@ -191,44 +155,43 @@ TEST_F(ModelRenderTest, SteadyFramesAllocateNothing) {
   std::vector<jobject> meshes;
   for (int i = 0; i < 30; ++i) {
     Mesh mesh = random_mesh(r, true);
-    if (mesh.ftex)
-      std::replace_if(
-          mesh.ftex->begin(), mesh.ftex->end(), [](int id) { return id % undelivered == 0; }, 1);
+    for (std::size_t f = 0; mesh.ftex && f < mesh.ftex->size(); ++f) {
+      if ((*mesh.ftex)[f] % undelivered == 0) (*mesh.ftex)[f] = 1;
+    }
     meshes.push_back(build(mesh));
   }
   random_state(r);
-  random_target(r, true, true);
   const Matrix_c world = matrix(placed(1, 0.2f, 1, 0, 0, 400));
   auto& resource = *native<threadresource>(resource_peer);
   copied_jintArray no_result(env, nullptr);
-  const auto frame = [&] {
+  const auto allocations_of_a_frame = [&] {
+    random_target(r);
+    const unsigned long before = allocation_failure::count();
     for (jobject mesh : meshes) get(mesh).render(resource, world, no_result);
-    return allocation_failure::count();
+    return allocation_failure::count() - before;
   };
-  const unsigned long first = frame();
-  EXPECT_GT(first, 0u);
-  random_target(r, true, true);
-  const unsigned long before = allocation_failure::count();
-  EXPECT_EQ(frame(), before);
+  EXPECT_GT(allocations_of_a_frame(), 0u);
+  EXPECT_EQ(allocations_of_a_frame(), 0u);
   for (jobject mesh : meshes) Java_h_ma(env, mesh);
 }
 
 // Memory that runs out at any allocation of a build or of a first draw: nothing is lost, and the next draw is whole.
 TEST_F(ModelRenderTest, ShortPoolsLoseNothing) {
   test_random r(16);
-  Mesh mesh = random_mesh(r, true);
-  while (mesh.inputfacecount < 30 || !mesh.ftype || !mesh.falpha || mesh.mappingcount > 0) mesh = random_mesh(r, true);
-  const auto new_target = [this] {
+  Mesh mesh;
+  do mesh = random_mesh(r, true);
+  while (mesh.inputfacecount < 30 || !mesh.ftype || !mesh.falpha || mesh.mappingcount > 0);
+  const Numbers world = placed(2, 0, 1, 0, 0, 350);
+  const auto drawn = [&](jobject object) {
     test_random state(5);
     random_state(state);
-    random_target(state, true, true);
+    random_target(state);
+    draw(object, world);
+    return colour.copy();
   };
-  const Numbers world = placed(2, 0, 1, 0, 0, 350);
   const jobject object = build(mesh);
-  draw(object, world);  // fetches the textures
-  new_target();
-  draw(object, world);
-  const auto expected = colour.copy();
+  drawn(object);  // fetches the textures
+  const auto expected = drawn(object);
   Java_h_ma(env, object);
 
   int builds = 0, draws = 0;
@@ -247,9 +210,7 @@ TEST_F(ModelRenderTest, ShortPoolsLoseNothing) {
     }
     filler = {};
     if (built) {
-      new_target();
-      draw(object, world);
-      ASSERT_EQ(colour.copy(), expected);
+      ASSERT_EQ(drawn(object), expected);
       Java_h_ma(env, object);
     }
     ASSERT_EQ(Java_ja_za(env, peer), 0);
@@ -267,52 +228,44 @@ TEST_F(ModelRenderTest, Quirks) {
   mesh.corner[0] = {{0}}, mesh.corner[1] = {{2}}, mesh.corner[2] = {{1}};
   mesh.fhsl = {{0}};
   mesh.ftype = {{1}};
-  make_target(width, height);
   perspective(50, 1500);
   Java_ja_IA(env, peer, -50);
   const jobject object = build(mesh);
   EXPECT_EQ(Java_h_RA(env, object), 65531) << "negative bounds arrive as 16 bits";
-  const auto largest = [this] {
-    const auto pixels = colour.copy();
-    return *std::max_element(pixels.begin(), pixels.end());
+  const auto largest_of_a_draw = [&](float y, float z, jintArray result) {
+    make_target(width, height);
+    depth.fill(1);
+    draw(object, placed(0, 0, 1, 0, y, z), result);
+    return *std::max_element(colour.data(), colour.data() + colour.elements());
   };
-
-  depth.fill(1);
-  draw(object, placed(0, 0, 1, 0, 0, 300));
-  EXPECT_EQ(largest(), 0xFF040404u) << "no light leaves less than 4";
-
+  EXPECT_EQ(largest_of_a_draw(0, 300, nullptr), 0xFF040404u) << "no light leaves less than 4";
   const jintArray result = java.new_ints({1, 2, 3, 4, 5, 6});
-  draw(object, placed(0, 0, 1, 0, 0, -600), result);
+  EXPECT_EQ(largest_of_a_draw(0, -600, result), 0u);
   EXPECT_EQ(java.ints(result), (std::vector<jint>{1, 2, 3, 4, 5, 6})) << "a culled model leaves the array alone";
-
-  // Wholly in the fog at one corner: gone, though the others are clear.
-  make_target(width, height);
-  depth.fill(1);
   Java_ja_M(env, peer, 60, 0xFFFFFF, 120, 0);
-  draw(object, placed(0, 0, 1, 0, -1, 300));
-  EXPECT_NE(largest(), 0u);
-  make_target(width, height);
-  depth.fill(1);
-  draw(object, placed(0, 0, 1, 0, 0, 300));
-  EXPECT_EQ(largest(), 0u);
+  EXPECT_NE(largest_of_a_draw(-1, 300, nullptr), 0u);
+  EXPECT_EQ(largest_of_a_draw(0, 300, nullptr), 0u) << "wholly in the fog at one corner: gone, though others are clear";
   Java_h_ma(env, object);
 }
 
 TEST_F(ModelRenderTest, ModelsOfAPoolThatIsGone) {
   test_random r(4);
   const jobject object = build(random_mesh(r, true));
-  random_target(r, true, true);
+  random_target(r);
   const auto frame = colour.copy();
   Java_ba_ma(env, pool_peer);
   if (VELMARK5_CHECKS) {
+    const std::string exception = "java.lang.IllegalStateException: model: its pool is gone";
     draw(object, placed(0, 0, 1, 0, 0, 400));
-    EXPECT_EQ(java.take_exception(), "java.lang.IllegalStateException: model: its pool is gone");
+    EXPECT_EQ(java.take_exception(), exception);
     Java_h_N(env, object);
-    EXPECT_EQ(java.take_exception(), "java.lang.IllegalStateException: model: its pool is gone");
-    EXPECT_EQ(colour.copy(), frame);
+    EXPECT_EQ(java.take_exception(), exception);
+    EXPECT_TRUE(same_image(colour, frame.data()));
   }
   Java_h_ma(env, object);
   EXPECT_EQ(java.take_exception(), "");
   EXPECT_EQ(java.nativeid(object), 0);
   EXPECT_EQ(Java_ja_za(env, peer), 0);
 }
+
+}  // namespace
