@@ -29,46 +29,72 @@ VELMARK5_LANE unsigned int sunlit(const toolkit& t, unsigned int rgb, unsigned i
          channel(rgb & 0xFF, t.sun_b);
 }
 
-// sun_intensity of three normals at once; the last lane is that of the third again.
-VELMARK5_LANE SSEMath::Int4 sun_intensities(const toolkit& t, const Vector4_s& n0, const Vector4_s& n1,
-                                            const Vector4_s& n2, float contrastfactor) {
-  using namespace SSEMath;
-  const Float4 p = load(&n0.x), q = load(&n1.x), r = load(&n2.x);
-  const Float4 xy_pq{_mm_unpacklo_ps(p.v, q.v)}, zw_pq{_mm_unpackhi_ps(p.v, q.v)};
-  const Float4 x = shuffle<0, 1, 0, 0>(xy_pq, r), y = shuffle<2, 3, 1, 1>(xy_pq, r);
-  const Float4 z = shuffle<0, 1, 2, 2>(zw_pq, r), w = shuffle<2, 3, 3, 3>(zw_pq, r);
-  const Float4 d{_mm_div_ps((splat(t.sun_x) * x + splat(t.sun_y) * y + splat(t.sun_z) * z).v, w.v)};
-  const Float4 side = select(less(splat(0.0f), d), splat(t.sun_front), splat(t.sun_back));
-  return truncate((splat(t.ambient) + d * side * splat(contrastfactor)) * splat(256.0f));
-}
+// The sun as the corners of many faces need it, read from the scene once.
+class sun {
+ public:
+  explicit sun(const toolkit& t)
+      : x_(SSEMath::splat(t.sun_x)),
+        y_(SSEMath::splat(t.sun_y)),
+        z_(SSEMath::splat(t.sun_z)),
+        front_(SSEMath::splat(t.sun_front)),
+        back_(SSEMath::splat(t.sun_back)),
+        ambient_(SSEMath::splat(t.ambient)),
+        colour_(SSEMath::widen_low(SSEMath::splat(static_cast<std::uint32_t>(t.sun_r) << 16 |
+                                                  static_cast<std::uint32_t>(t.sun_g) << 8 | t.sun_b))),
+        scene_(t) {}
 
-// sunlit of the words of three corners with an intensity each, opaque.
-VELMARK5_LANE SSEMath::Int4 sunlit_corners(const toolkit& t, SSEMath::Int4 rgb, SSEMath::Int4 intensity) {
-  using namespace SSEMath;
-  const Int4 narrowed{_mm_srai_epi32(_mm_slli_epi32(intensity.v, 16), 16)};
-  if (lane_bits(equal(narrowed, intensity)) != 15) {
-    // Too strong for products of 16-bit words.
-    const auto alone = [&](std::int32_t word, std::int32_t strength) {
-      return static_cast<int>(sunlit(t, static_cast<unsigned int>(word), 255, strength));
-    };
-    return {_mm_setr_epi32(alone(lane<0>(rgb), lane<0>(intensity)), alone(lane<1>(rgb), lane<1>(intensity)),
-                           alone(lane<2>(rgb), lane<2>(intensity)), 0)};
+  // sun_intensity of three normals at once; the last lane is that of the third again.
+  VELMARK5_LANE SSEMath::Int4 intensities(const Vector4_s& n0, const Vector4_s& n1, const Vector4_s& n2,
+                                          SSEMath::Float4 contrastfactor) const {
+    using namespace SSEMath;
+    const Float4 p = load(&n0.x), q = load(&n1.x), r = load(&n2.x);
+    const Float4 xy_pq{_mm_unpacklo_ps(p.v, q.v)}, zw_pq{_mm_unpackhi_ps(p.v, q.v)};
+    const Float4 x = shuffle<0, 1, 0, 0>(xy_pq, r), y = shuffle<2, 3, 1, 1>(xy_pq, r);
+    const Float4 z = shuffle<0, 1, 2, 2>(zw_pq, r), w = shuffle<2, 3, 3, 3>(zw_pq, r);
+    const Float4 d{_mm_div_ps((x_ * x + y_ * y + z_ * z).v, w.v)};
+    const Float4 side = select(less(splat(0.0f), d), front_, back_);
+    return truncate((ambient_ + d * side * contrastfactor) * splat(256.0f));
   }
-  const auto sun_word = static_cast<std::uint32_t>(t.sun_r) << 16 | static_cast<std::uint32_t>(t.sun_g) << 8 | t.sun_b;
-  const Word8 sun = widen_low(splat(sun_word));
-  const Word8 low = shift_right<8>(widen_low(rgb) * sun), high = shift_right<8>(widen_high(rgb) * sun);
-  const auto product = [](__m128i channels, Int4 strength) {
-    return _mm_srai_epi32(_mm_madd_epi16(channels, strength.v), 8);
-  };
-  const __m128i zero = _mm_setzero_si128();
-  const __m128i c0 = product(_mm_unpacklo_epi16(low.v, zero), shuffle<0, 0, 0, 0>(intensity));
-  const __m128i c1 = product(_mm_unpackhi_epi16(low.v, zero), shuffle<1, 1, 1, 1>(intensity));
-  const __m128i c2 = product(_mm_unpacklo_epi16(high.v, zero), shuffle<2, 2, 2, 2>(intensity));
-  const auto limited = [](__m128i p, __m128i q) {
-    return Word8{_mm_max_epi16(_mm_min_epi16(_mm_packs_epi32(p, q), _mm_set1_epi16(252)), _mm_set1_epi16(4))};
-  };
-  return narrow(limited(c0, c1), limited(c2, c2)) | splat(0xFF000000u);
-}
+
+  // sunlit of the words of three corners with an intensity each, opaque. Each channel fills a 16-bit word: of the first
+  // two corners, and of the third in the low half.
+  VELMARK5_LANE SSEMath::Channels corners(SSEMath::Int4 rgb, SSEMath::Int4 intensity) const {
+    using namespace SSEMath;
+    // Twice the intensity, if that fits a word.
+    const __m128i high = _mm_slli_epi32(intensity.v, 17);
+    if (lane_bits(equal(Int4{_mm_srai_epi32(high, 17)}, intensity)) != 15) return one_by_one(rgb, intensity);
+    const __m128i twice = _mm_srai_epi32(high, 16);
+    const __m128i packed = _mm_packs_epi32(twice, twice);
+    const Int4 pairs{_mm_unpacklo_epi16(packed, packed)};
+    // channel * sun >> 8, times 128: with the doubled intensity the high half of the product is what is left after
+    // its 8 bits.
+    const auto lit = [this](Word8 channels, Int4 strength) {
+      const Word8 coloured = shift_left<7>(shift_right<8>(channels * colour_));
+      const __m128i product = _mm_mulhi_epi16(coloured.v, strength.v);
+      const __m128i limited = _mm_max_epi16(_mm_min_epi16(product, _mm_set1_epi16(252)), _mm_set1_epi16(4));
+      return Word8{_mm_or_si128(_mm_slli_epi16(limited, 8), _mm_set1_epi64x(static_cast<std::int64_t>(opaque)))};
+    };
+    return {lit(widen_low(rgb), shuffle<0, 0, 1, 1>(pairs)), lit(widen_high(rgb), shuffle<2, 2, 2, 2>(pairs))};
+  }
+
+ private:
+  static constexpr std::uint64_t opaque = 0xFF00'0000'0000'0000;
+
+  // Intensities that are too strong for products of 16-bit words.
+  SSEMath::Channels one_by_one(SSEMath::Int4 rgb, SSEMath::Int4 intensity) const {
+    using namespace SSEMath;
+    const auto alone = [this](std::int32_t word, std::int32_t strength) {
+      return static_cast<int>(sunlit(scene_, static_cast<unsigned int>(word), 255, strength));
+    };
+    return widen_shifted(
+        {_mm_setr_epi32(alone(lane<0>(rgb), lane<0>(intensity)), alone(lane<1>(rgb), lane<1>(intensity)),
+                        alone(lane<2>(rgb), lane<2>(intensity)), 0)});
+  }
+
+  SSEMath::Float4 x_, y_, z_, front_, back_, ambient_;
+  SSEMath::Word8 colour_;
+  const toolkit& scene_;
+};
 
 // Adds the point lights, whose model-space positions are given: each by the cosine over the squared distance. All four
 // bytes are lit alike.

@@ -1,14 +1,15 @@
-// The drawing of one model by compile-time switches: vertices into the thread's scratch, then face by face through the
-// cheapest rejections first, light, and one triangle instance. Opaque faces come first, translucent ones second, both
-// in face order; the depth buffer does the rest.
+// The drawing of one model by compile-time switches: vertices into the thread's scratch, the faces that show, and for
+// each of them light and one triangle instance. Opaque faces come first, translucent ones second, both in face order;
+// the depth buffer does the rest.
 #pragma once
 
 #include <bit>
 #include <cstdint>
 
 #include "model/model.h"
+#include "model/model_culling.h"
 #include "model/model_lighting.h"
-#include "raster/Projection.h"
+#include "raster/Rasterizer.h"
 #include "raster/Triangle.h"
 #include "texture/texturecache.h"
 #include "toolkit/threadresource.h"
@@ -21,14 +22,19 @@ class face_drawer {
       : mesh(drawn),
         resource(scratch),
         scene(*toolkit::m_pInstance),
-        flat_factor(512.0f / static_cast<float>(drawn.contrast)),
-        smooth_factor(768.0f / static_cast<float>(drawn.contrast)) {
+        sunlight(scene),
+        flat_factor(SSEMath::splat(512.0f / static_cast<float>(drawn.contrast))),
+        smooth_factor(SSEMath::splat(768.0f / static_cast<float>(drawn.contrast))),
+        textured_faces(scene.textures != nullptr ? drawn.texfacecount : 0) {
     if constexpr (HEIGHTFOG) triangle.fogcolour = Rasterizer_n::m_HeightFogColour;
   }
 
-  void draw_all() {
+  void draw_all(culling::flag_summary flags) {
+    read_arrays();
+    if constexpr (COLOUR) prefetch_normals();
+    culling::find_visible({fa, fb, fc}, mesh.facecount, resource, flags, visible);
     if (!mesh.hasalpha) {
-      draw_pass<pass::all>();
+      draw_visible();
     } else {
       draw_pass<pass::opaque>();
       draw_pass<pass::translucent>();
@@ -36,33 +42,88 @@ class face_drawer {
   }
 
  private:
-  enum class pass { all, opaque, translucent };
+  enum class pass { opaque, translucent };
   static constexpr auto fog = Rasterizer_n::FogMode_e((DISTANCEFOG ? 2 : 0) + (HEIGHTFOG ? 1 : 0));
   static constexpr unsigned int blending_texture = 2;
   static constexpr unsigned int keyed_texture = 1;
   static constexpr unsigned char unlit_material = 6;
   static constexpr unsigned char invisible = 255;
 
-  // The texture of a face; null for none, and when the client does not deliver it. Can call into Java: what was read
-  // from the model's arrays before is stale.
-  cachedtexture* texture_of(int f) {
-    if (f >= mesh.texfacecount || scene.textures == nullptr) return nullptr;
-    return scene.textures->gettex(mesh.ftex[f]);
+  using instance = void (*)(const Rasterizer_n::Triangle_s&);
+
+  // The blocks stay in place until Java is called.
+  void read_arrays() {
+    fa = mesh.fa.data(), fb = mesh.fb.data(), fc = mesh.fc.data();
+    fcolours = mesh.fcolours.data();
+    ftex = mesh.ftex.data();
+    fuv0 = mesh.fuv0.data(), fuv1 = mesh.fuv1.data(), fuv2 = mesh.fuv2.data();
+    ftype = mesh.ftype.data();
+    falpha = mesh.falpha.data();
+    fnormal = mesh.fnormal.data();
+    vnormal = mesh.vnormal.data();
+    vsharednormal = mesh.vsharednormal.data();
+    vpos = mesh.vpos.data();
   }
 
+  // Read in no order. They arrive while the faces are culled.
+  void prefetch_normals() const {
+    culling::prefetch(vnormal, mesh.meshvertexcount * static_cast<int>(sizeof *vnormal));
+  }
+
+  // A word's faces, while those before them are drawn. Too far is harmless.
+  void prefetch_faces(int first) const {
+    if (first >= mesh.facecount || visible.word_of(first) == 0) return;
+    constexpr int faces = culling::face_set::word_bits;
+    culling::prefetch(fcolours + first, faces * static_cast<int>(sizeof *fcolours));
+    if (first >= mesh.texfacecount) return;
+    culling::prefetch(ftex + first, faces * static_cast<int>(sizeof *ftex));
+    culling::prefetch(fuv0 + first, faces * static_cast<int>(sizeof *fuv0));
+    culling::prefetch(fuv1 + first, faces * static_cast<int>(sizeof *fuv1));
+    culling::prefetch(fuv2 + first, faces * static_cast<int>(sizeof *fuv2));
+  }
+
+  // The texture of a face; null for none, and when the client does not deliver it. Can call into Java.
+  VELMARK5_LANE const cachedtexture* texture_of(int f) {
+    if (f >= textured_faces) return nullptr;
+    // The texture that was asked for last is still there. One that did not come is asked for again.
+    if (ftex[f] != latest_id) ask_for(ftex[f]);
+    return latest;
+  }
+
+  [[gnu::noinline]] void ask_for(unsigned short id) {
+    latest = scene.textures->gettex(id);
+    latest_id = latest != nullptr ? id : no_id;
+    read_arrays();
+    if (COLOUR && latest != nullptr) prepare(*latest);
+  }
+
+  unsigned char type_of(int f) const { return ftype != nullptr ? ftype[f] : FT_SMOOTH; }
+  unsigned char transparency_of(int f) const { return falpha != nullptr ? falpha[f] : 0; }
+
+  void draw_visible() {
+    if constexpr (COLOUR) prefetch_faces(0);
+    for (int first = 0; first < mesh.facecount; first += culling::face_set::word_bits) {
+      if constexpr (COLOUR) prefetch_faces(first + culling::face_set::word_bits);
+      for (std::uint32_t bits = visible.word_of(first); bits != 0; bits &= bits - 1) {
+        const int f = first + std::countr_zero(bits);
+        const unsigned char type = type_of(f), transparency = transparency_of(f);
+        if (type != FT_HIDDEN && transparency != invisible) draw_face(f, type, transparency);
+      }
+    }
+  }
+
+  // Asks for the textures of faces that do not show, too.
   template <pass P>
   void draw_pass() {
     for (int f = 0; f < mesh.facecount; ++f) {
-      const unsigned char type = mesh.ftype.address != nullptr ? mesh.ftype[f] : FT_SMOOTH;
-      const unsigned char transparency = mesh.falpha.address != nullptr ? mesh.falpha[f] : 0;
+      const unsigned char type = type_of(f), transparency = transparency_of(f);
       if (type == FT_HIDDEN || transparency == invisible) continue;
       if constexpr (P == pass::opaque) {
         if (transparency != 0 || has_blending_texture(f)) continue;
-      }
-      if constexpr (P == pass::translucent) {
+      } else {
         if (transparency == 0 && !has_blending_texture(f)) continue;
       }
-      draw_face(f, type, transparency);
+      if (visible.contains(f)) draw_face(f, type, transparency);
     }
   }
 
@@ -72,38 +133,33 @@ class face_drawer {
   }
 
   void draw_face(int f, unsigned char type, unsigned char transparency) {
-    const int a = mesh.fa[f], b = mesh.fb[f], c = mesh.fc[f];
-    const int flags = resource.vertex_flags[a] & resource.vertex_flags[b] & resource.vertex_flags[c];
-    if (flags != Rasterizer_n::CullFlagsVisible) return;
+    const int a = fa[f], b = fb[f], c = fc[f];
     // Whole registers: the triangle stage loads them whole, and would wait for parts.
     const auto copy = [](Vector4_s& out, const Vector4_s& in) { SSEMath::store(&out.x, SSEMath::load(&in.x)); };
     copy(triangle.vertex[0], resource.vertices[a]);
     copy(triangle.vertex[1], resource.vertices[b]);
     copy(triangle.vertex[2], resource.vertices[c]);
-    if (!Rasterizer_n::FacesViewer(triangle.vertex[0], triangle.vertex[1], triangle.vertex[2])) return;
     using namespace Rasterizer_n;
     if constexpr (!COLOUR) {
       RenderTriangle<ShadeMode_e::Flat, TexAddressMode_e::GroundWrap, TexAddressMode_e::GroundWrap, false,
                      FogMode_e::None, BlendMode_e::Opaque, false, false, true, false, true>(triangle);
     } else {
       if (HEIGHTFOG && !fog_corners(a, b, c)) return;
-      const auto& corners = mesh.fcolours[f].corner;
-      alignas(16) unsigned int words[4] = {corners[0], corners[1], corners[2], 0};
       const cachedtexture* const texture = texture_of(f);
-      if (texture == nullptr || texture->lighting_kind != unlit_material) light_face(f, type, a, b, c, words);
-      for (int k = 0; k < 3; ++k) expand(words[k], triangle.colour[k]);
+      if (type > FT_FLAT || (texture != nullptr && texture->lighting_kind == unlit_material)) {
+        set_colours(SSEMath::widen_shifted(colours_of(f)));
+      } else {
+        light_face(f, type == FT_SMOOTH, a, b, c);
+      }
       triangle.alpha = (255u - transparency) * 0x10001u;
+      const bool translucent = transparency != 0;
       if (texture == nullptr || texture->texels == nullptr) {
-        draw_untextured(transparency != 0);
+        draw_untextured(translucent);
         return;
       }
-      place_texture(f, *texture);
-      if (transparency != 0 || texture->alpha_kind == blending_texture) mesh.hasalpha = true;
-      if (texture->wrap_u || texture->wrap_v) {
-        draw_textured<TexAddressMode_e::Wrap>(texture->alpha_kind, transparency != 0);
-      } else {
-        draw_textured<TexAddressMode_e::Clamp>(texture->alpha_kind, transparency != 0);
-      }
+      place_texture(f);
+      if (translucent || texture->alpha_kind == blending_texture) mesh.hasalpha = true;
+      (translucent ? translucent_instance : opaque_instance)(triangle);
     }
   }
 
@@ -114,49 +170,72 @@ class face_drawer {
     const Float4 height = floats(word(a), word(b), word(c), 1) - splat(scene.underwater_height_f);
     const Float4 factor = min(max(height * splat(scene.underwater_scale), splat(0.0f)), splat(1.0f));
     store(&triangle.fogfactor.x, factor);
-    const Vector4_s& f = triangle.fogfactor;
-    return f.x != 1.0f && f.y != 1.0f && f.z != 1.0f;
+    return (lane_bits(equal(factor, splat(1.0f))) & 7) == 0;
+  }
+
+  // The words of the three corners.
+  VELMARK5_LANE SSEMath::Int4 colours_of(int f) const {
+    const unsigned int* const corner = fcolours[f].corner;
+    const __m128i two = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(corner));
+    return {_mm_unpacklo_epi64(two, _mm_cvtsi32_si128(static_cast<int>(corner[2])))};
+  }
+
+  // Each channel times 256, of the first two corners and of the third.
+  VELMARK5_LANE void set_colours(SSEMath::Channels colours) {
+    const auto store = [this](int k) { return reinterpret_cast<double*>(triangle.colour[k].channels); };
+    const __m128d two = _mm_castsi128_pd(colours.low.v);
+    _mm_store_sd(store(0), two);
+    _mm_storeh_pd(store(1), two);
+    _mm_store_sd(store(2), _mm_castsi128_pd(colours.high.v));
   }
 
   // The normal that a smooth face has at a vertex.
-  const Vector4_s& vertex_normal(int v) const {
-    const bool shared = mesh.vsharednormal.address != nullptr && mesh.vsharednormal[v].w != 0.0f;
-    return shared ? mesh.vsharednormal[v] : mesh.vnormal[v];
+  VELMARK5_LANE const Vector4_s& vertex_normal(int v) const {
+    const bool shared = vsharednormal != nullptr && vsharednormal[v].w != 0.0f;
+    return shared ? vsharednormal[v] : vnormal[v];
   }
 
-  // Lights the words of the three corners.
-  VELMARK5_LANE void light_face(int f, unsigned char type, int a, int b, int c, unsigned int* words) {
-    if (type > FT_FLAT) return;
-    const bool smooth = type == FT_SMOOTH;
-    const Vector4_s& na = smooth ? vertex_normal(a) : mesh.fnormal[f];
+  VELMARK5_LANE void light_face(int f, bool smooth, int a, int b, int c) {
+    const Vector4_s& na = smooth ? vertex_normal(a) : fnormal[f];
     const Vector4_s& nb = smooth ? vertex_normal(b) : na;
     const Vector4_s& nc = smooth ? vertex_normal(c) : na;
-    const float contrast_factor = smooth ? smooth_factor : flat_factor;
-    const SSEMath::Int4 intensities = lighting::sun_intensities(scene, na, nb, nc, contrast_factor);
-    SSEMath::store(words, lighting::sunlit_corners(scene, SSEMath::load(words), intensities));
-    if constexpr (POINTLIT) {
-      words[0] = lighting::pointlit(scene, mesh.lightpos, words[0], mesh.vpos[a], na);
-      words[1] = lighting::pointlit(scene, mesh.lightpos, words[1], mesh.vpos[b], nb);
-      words[2] = lighting::pointlit(scene, mesh.lightpos, words[2], mesh.vpos[c], nc);
+    const SSEMath::Int4 intensities = sunlight.intensities(na, nb, nc, smooth ? smooth_factor : flat_factor);
+    const SSEMath::Channels sunlit = sunlight.corners(colours_of(f), intensities);
+    if constexpr (!POINTLIT) {
+      set_colours(sunlit);
+    } else {
+      alignas(16) unsigned int words[4];
+      SSEMath::store(words, SSEMath::narrow(SSEMath::shift_right<8>(sunlit)));
+      words[0] = lighting::pointlit(scene, mesh.lightpos, words[0], vpos[a], na);
+      words[1] = lighting::pointlit(scene, mesh.lightpos, words[1], vpos[b], nb);
+      words[2] = lighting::pointlit(scene, mesh.lightpos, words[2], vpos[c], nc);
+      set_colours(SSEMath::widen_shifted(SSEMath::load(words)));
     }
   }
 
-  // Bytes to channels times 256.
-  static void expand(unsigned int word, Rasterizer_n::VertexColour_s& out) {
-    _mm_store_si128(reinterpret_cast<__m128i*>(&out),
-                    _mm_unpacklo_epi8(_mm_setzero_si128(), _mm_cvtsi32_si128(static_cast<int>(word))));
+  // What all faces with the texture have in common.
+  void prepare(const cachedtexture& texture) {
+    triangle.texture[0] = texture.texels;
+    // Each corner has a base of its own in the record.
+    const auto base = [](float u, float v) { return SSEMath::floats(u, v, u, v); };
+    bases[0] = base(texture.offset_u.z, texture.offset_v.z);
+    bases[1] = base(texture.offset_u.y, texture.offset_v.y);
+    bases[2] = base(texture.offset_u.x, texture.offset_v.x);
+    if (texture.wrap_u || texture.wrap_v) {
+      choose<Rasterizer_n::TexAddressMode_e::Wrap>(texture.alpha_kind);
+    } else {
+      choose<Rasterizer_n::TexAddressMode_e::Clamp>(texture.alpha_kind);
+    }
   }
 
-  // Each corner has a base of its own in the record.
-  void place_texture(int f, const cachedtexture& texture) {
-    const auto row = [](Vector4_s& out, float u, float v, const texture_coordinates& t) {
+  VELMARK5_LANE void place_texture(int f) {
+    const auto place = [this](std::size_t corner, const texture_coordinates& t) {
       const SSEMath::Float4 own{_mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(&t)))};
-      SSEMath::store(&out.x, SSEMath::floats(u, v, u, v) + SSEMath::shuffle<0, 1, 0, 1>(own));
+      SSEMath::store(&triangle.texcoord[corner].x, bases[corner] + SSEMath::shuffle<0, 1, 0, 1>(own));
     };
-    row(triangle.texcoord[0], texture.offset_u.z, texture.offset_v.z, mesh.fuv0[f]);
-    row(triangle.texcoord[1], texture.offset_u.y, texture.offset_v.y, mesh.fuv1[f]);
-    row(triangle.texcoord[2], texture.offset_u.x, texture.offset_v.x, mesh.fuv2[f]);
-    triangle.texture[0] = texture.texels;
+    place(0, fuv0[f]);
+    place(1, fuv1[f]);
+    place(2, fuv2[f]);
   }
 
   void draw_untextured(bool translucent) const {
@@ -171,59 +250,59 @@ class face_drawer {
     }
   }
 
+  // The instances that draw a texture's faces.
   template <Rasterizer_n::TexAddressMode_e Address>
-  void draw_textured(unsigned int alpha_kind, bool translucent) const {
+  void choose(unsigned int alpha_kind) {
     using namespace Rasterizer_n;
-    constexpr auto shade = ShadeMode_e::Textured;
     if (alpha_kind == blending_texture) {
       // Under height fog these faces leave the depth alone.
-      RenderTriangle<shade, Address, Address, false, fog, BlendMode_e::PixelAlpha, false, false, !HEIGHTFOG, true,
-                     DEPTH>(triangle);
+      opaque_instance = translucent_instance =
+          RenderTriangle<ShadeMode_e::Textured, Address, Address, false, fog, BlendMode_e::PixelAlpha, false, false,
+                         !HEIGHTFOG, true, DEPTH>;
     } else if (alpha_kind == keyed_texture) {
-      draw_keyed<Address, true>(translucent);
+      choose_keyed<Address, true>();
     } else {
-      draw_keyed<Address, false>(translucent);
+      choose_keyed<Address, false>();
     }
   }
 
   template <Rasterizer_n::TexAddressMode_e Address, bool ColourKey>
-  void draw_keyed(bool translucent) const {
+  void choose_keyed() {
     using namespace Rasterizer_n;
     constexpr auto shade = ShadeMode_e::Textured;
-    if (translucent) {
-      RenderTriangle<shade, Address, Address, false, fog, BlendMode_e::ConstantAlpha, ColourKey, false, true, true,
-                     DEPTH>(triangle);
-    } else {
-      RenderTriangle<shade, Address, Address, false, fog, BlendMode_e::Opaque, ColourKey, false, true, true, DEPTH>(
-          triangle);
-    }
+    opaque_instance =
+        RenderTriangle<shade, Address, Address, false, fog, BlendMode_e::Opaque, ColourKey, false, true, true, DEPTH>;
+    translucent_instance = RenderTriangle<shade, Address, Address, false, fog, BlendMode_e::ConstantAlpha, ColourKey,
+                                          false, true, true, DEPTH>;
   }
 
   model& mesh;
   threadresource& resource;
   const toolkit& scene;
-  const float flat_factor, smooth_factor;
+  const lighting::sun sunlight;
+  const SSEMath::Float4 flat_factor, smooth_factor;
+
+  const unsigned short *fa, *fb, *fc, *ftex;
+  const face_colours* fcolours;
+  const texture_coordinates *fuv0, *fuv1, *fuv2;
+  const unsigned char *ftype, *falpha;
+  const Vector4_s *fnormal, *vnormal, *vsharednormal, *vpos;
+
+  const int textured_faces;
+  static constexpr int no_id = -1;
+  int latest_id = no_id;
+  const cachedtexture* latest = nullptr;  // what the cache was asked for last, and what goes with it:
+  SSEMath::Float4 bases[3];               // of texture coordinates, per corner
+  instance opaque_instance, translucent_instance;
+
   Rasterizer_n::Triangle_s triangle;
+  culling::face_set visible;
 };
 
 template <bool POINTLIT, bool DISTANCEFOG, bool HEIGHTFOG, bool COLOUR, bool DEPTH>
 void model::render2(threadresource& resource, const Matrix_c& world, const Matrix_c& modelviewprojection) {
-  using namespace SSEMath;
-  for (int i = 0; i < meshvertexcount; ++i) {
-    const Float4 p = load(&vpos[i].x);
-    const Float4 screen = Rasterizer_n::ToScreen(
-        Rasterizer_n::Transform(modelviewprojection, broadcast<0>(p), broadcast<1>(p), broadcast<2>(p)));
-    store(&resource.vertices[i].x, shuffle<0, 1, 2, 2>(screen));
-    resource.vertex_flags[i] =
-        static_cast<unsigned char>(Rasterizer_n::CullFlags(Rasterizer_n::PackForCulling<false>(screen)));
-  }
-  if constexpr (HEIGHTFOG) {
-    // Up is minus y.
-    for (int i = 0; i < vertexcount; ++i) {
-      const Vector4_s& p = vpos[i];
-      const float y = p.x * world.rows[0].y + p.y * world.rows[1].y + p.z * world.rows[2].y + world.rows[3].y;
-      resource.vertex_words[i] = std::bit_cast<unsigned int>(-y);
-    }
-  }
-  face_drawer<POINTLIT, DISTANCEFOG, HEIGHTFOG, COLOUR, DEPTH>(*this, resource).draw_all();
+  const culling::flag_summary vertex_flags =
+      culling::project(vpos.data(), meshvertexcount, modelviewprojection, resource);
+  if constexpr (HEIGHTFOG) culling::find_heights(vpos.data(), vertexcount, world, resource);
+  face_drawer<POINTLIT, DISTANCEFOG, HEIGHTFOG, COLOUR, DEPTH>(*this, resource).draw_all(vertex_flags);
 }

@@ -34,8 +34,10 @@ TEST_F(model_lighting_test, three_corners_at_once_are_lit_as_each_alone) {
     }
     const float contrast = random.real(0, 3);
     alignas(16) unsigned int words[4] = {random.word(), random.word(), random.word(), 0}, lit[4];
-    const auto intensities = lighting::sun_intensities(t, normal[0], normal[1], normal[2], contrast);
-    SSEMath::store(lit, lighting::sunlit_corners(t, SSEMath::load(words), intensities));
+    const lighting::sun sun(t);
+    const auto intensities = sun.intensities(normal[0], normal[1], normal[2], SSEMath::splat(contrast));
+    const auto channels = sun.corners(SSEMath::load(words), intensities);
+    SSEMath::store(lit, SSEMath::narrow(SSEMath::shift_right<8>(channels)));
     for (int k = 0; k < 3; ++k) {
       const int alone = lighting::sun_intensity(t, normal[k], contrast);
       ASSERT_EQ(lit[k], lighting::sunlit(t, words[k], 255, alone)) << round << " corner " << k << " " << alone;
