@@ -99,6 +99,7 @@ VELMARK5_LANE Int4 operator&(Int4 a, Int4 b) { return {_mm_and_si128(a.v, b.v)};
 VELMARK5_LANE Int4 operator|(Int4 a, Int4 b) { return {_mm_or_si128(a.v, b.v)}; }
 VELMARK5_LANE Int4 and_not(Int4 keep, Int4 clear) { return {_mm_andnot_si128(clear.v, keep.v)}; }
 VELMARK5_LANE Int4 equal(Int4 a, Int4 b) { return {_mm_cmpeq_epi32(a.v, b.v)}; }
+VELMARK5_LANE Int4 less(Int4 a, Int4 b) { return {_mm_cmplt_epi32(a.v, b.v)}; }  // signed
 VELMARK5_LANE Int4 select(Int4 mask, Int4 set, Int4 clear) { return (mask & set) | and_not(clear, mask); }
 template <int Bits>
 VELMARK5_LANE Int4 shift_left(Int4 a) {

@@ -115,6 +115,7 @@ struct Operation<ColourOp_e::subtract> {
 
 // --- Blends ---------------------------------------------------------------------------------------------------------
 
+// terms(s) is what the image alone decides; the blend of that with d gives the pixel.
 template <BlendMode_e>
 struct Blending;
 
@@ -123,9 +124,10 @@ template <>
 struct Blending<BlendMode_e::replace> {
   static constexpr bool reads_target = false;
   template <class Source>
-  VELMARK5_LANE Int4 operator()(Source s, Int4) const {
+  VELMARK5_LANE static Int4 terms(Source s) {
     return packed(s);
   }
+  VELMARK5_LANE Int4 operator()(Int4 s, Int4) const { return s; }
 };
 
 // ((a * s) >> 8) + (((256 - a) * d) >> 8), where a is the alpha of s: the sum never leaves a byte. Primitives write a
@@ -133,24 +135,17 @@ struct Blending<BlendMode_e::replace> {
 template <>
 struct Blending<BlendMode_e::alpha> {
   static constexpr bool reads_target = true;
-  template <class Source>
-  VELMARK5_LANE Int4 operator()(Source s, Int4 d) const {
-    const Word8 a = alphas(s);
-    return packed(mulhi(planes_shifted(s), a) + mulhi(planes_shifted(d), splat_word(256) - a));
-  }
-
-  // What of it the image alone decides: the first product, and 256 - a in both words of each pixel.
+  // The first product, and 256 - a in both words of each pixel.
   struct Terms {
-    Int4 product, rest;
+    Planes product;
+    Word8 rest;
   };
   template <class Source>
   VELMARK5_LANE static Terms terms(Source s) {
     const Word8 a = alphas(s);
-    return {packed(mulhi(planes_shifted(s), a)), pixels(splat_word(256) - a)};
+    return {mulhi(planes_shifted(s), a), splat_word(256) - a};
   }
-  VELMARK5_LANE Int4 operator()(Terms s, Int4 d) const {
-    return add_bytes(s.product, packed(mulhi(planes_shifted(d), words(s.rest))));
-  }
+  VELMARK5_LANE Int4 operator()(Terms s, Int4 d) const { return packed(s.product + mulhi(planes_shifted(d), s.rest)); }
 };
 
 // Where every alpha is 0 or 255 that blend is d or max(s - 1, 0).
@@ -167,9 +162,10 @@ template <>
 struct Blending<BlendMode_e::additive> {
   static constexpr bool reads_target = true;
   template <class Source>
-  VELMARK5_LANE Int4 operator()(Source s, Int4 d) const {
-    return add_saturating_bytes(d, packed(s));
+  VELMARK5_LANE static Int4 terms(Source s) {
+    return packed(s);
   }
+  VELMARK5_LANE Int4 operator()(Int4 s, Int4 d) const { return add_saturating_bytes(d, s); }
 };
 
 // --- Where pixels come from -----------------------------------------------------------------------------------------
@@ -186,14 +182,6 @@ struct Row {
 VELMARK5_LANE Int4 gathered(Int4 a, Int4 b, Int4 c, Int4 d) {
   return {_mm_unpacklo_epi64(_mm_unpacklo_epi32(a.v, b.v), _mm_unpacklo_epi32(c.v, d.v))};
 }
-
-// The pixels at column[i].
-struct Columns {
-  const std::uint32_t* from;
-  const std::uint32_t* column;
-  VELMARK5_LANE Int4 operator()(int i) const { return gathered(one(i), one(i + 1), one(i + 2), one(i + 3)); }
-  VELMARK5_LANE Int4 one(int i) const { return load_one(from + column[i]); }
-};
 
 // The pixels along a line through the image: u and v in 20.12 fixed point, inside the image at every pixel that is
 // asked for.
@@ -227,47 +215,6 @@ struct Operated {
 template <ColourOp_e Op, class Source>
 Operated(Operation<Op>, Source) -> Operated<Op, Source>;
 
-// A row that is drawn several times, worked out as far as the target does not matter.
-template <BlendMode_e>
-struct Prepared {
-  static constexpr int capacity = 512;
-  alignas(16) std::uint32_t words[capacity];
-
-  template <class Source>
-  void put(int n, Source source) {
-    int i = 0;
-    for (; i + 4 <= n; i += 4) store(words + i, packed(source(i)));
-    for (; i < n; ++i) store_one(words + i, packed(source.one(i)));
-  }
-  VELMARK5_LANE Int4 operator()(int i) const { return load(words + i); }
-  VELMARK5_LANE Int4 one(int i) const { return load_one(words + i); }
-};
-
-template <>
-struct Prepared<BlendMode_e::alpha> {
-  using Blend = Blending<BlendMode_e::alpha>;
-  static constexpr int capacity = 512;
-  alignas(16) std::uint32_t products[capacity];
-  alignas(16) std::uint32_t rests[capacity];
-
-  template <class Source>
-  void put(int n, Source source) {
-    int i = 0;
-    for (; i + 4 <= n; i += 4) {
-      const Blend::Terms terms = Blend::terms(source(i));
-      store(products + i, terms.product);
-      store(rests + i, terms.rest);
-    }
-    for (; i < n; ++i) {
-      const Blend::Terms terms = Blend::terms(source.one(i));
-      store_one(products + i, terms.product);
-      store_one(rests + i, terms.rest);
-    }
-  }
-  VELMARK5_LANE Blend::Terms operator()(int i) const { return {load(products + i), load(rests + i)}; }
-  VELMARK5_LANE Blend::Terms one(int i) const { return {load_one(products + i), load_one(rests + i)}; }
-};
-
 // --- Runs -----------------------------------------------------------------------------------------------------------
 
 // Has the first pixels of a later row brought to the cache. Rows of a target are pages apart, where the processor does
@@ -277,19 +224,24 @@ VELMARK5_LANE void fetch_ahead(const std::uint32_t* row, int n) {
   for (int i = 0; i < n && i < 16 * line; i += line) _mm_prefetch(reinterpret_cast<const char*>(row + i), _MM_HINT_T0);
 }
 
-// Draws n pixels to `to`.
-template <BlendMode_e Blend, class Source>
-VELMARK5_LANE void draw_run(std::uint32_t* to, int n, Source&& source) {
+// Draws n pixels to `to`, and the same to the rows after it.
+template <BlendMode_e Blend, int Rows = 1, class Source>
+VELMARK5_LANE void draw_run(std::uint32_t* to, int n, Source&& source, std::ptrdiff_t pitch = 0) {
   constexpr Blending<Blend> blend;
   int i = 0;
 #pragma GCC unroll 2
   for (; i + 4 <= n; i += 4) {
-    const Int4 d = blend.reads_target ? load_unaligned(to + i) : Int4{};
-    store_unaligned(to + i, blend(source(i), d));
+    const auto s = blend.terms(source(i));
+    Int4 d[Rows];
+    for (int r = 0; r < Rows; ++r) d[r] = blend.reads_target ? load_unaligned(to + r * pitch + i) : Int4{};
+    for (int r = 0; r < Rows; ++r) store_unaligned(to + r * pitch + i, blend(s, d[r]));
   }
   for (; i < n; ++i) {
-    const Int4 d = blend.reads_target ? load_one(to + i) : Int4{};
-    store_one(to + i, blend(source.one(i), d));
+    const auto s = blend.terms(source.one(i));
+    for (int r = 0; r < Rows; ++r) {
+      const Int4 d = blend.reads_target ? load_one(to + r * pitch + i) : Int4{};
+      store_one(to + r * pitch + i, blend(s, d));
+    }
   }
 }
 
@@ -305,11 +257,11 @@ VELMARK5_LANE void draw_image_run(std::uint32_t* to, int n, Source&& source) {
       const Int4 d = load_unaligned(to + i);
       const Int4 e = load_unaligned(to + i + 4);
       const bool simple = only_clear_or_full(s, t);
-      store_unaligned(to + i, simple ? blend_clear_or_full(s, d) : blend(s, d));
-      store_unaligned(to + i + 4, simple ? blend_clear_or_full(t, e) : blend(t, e));
+      store_unaligned(to + i, simple ? blend_clear_or_full(s, d) : blend(blend.terms(s), d));
+      store_unaligned(to + i + 4, simple ? blend_clear_or_full(t, e) : blend(blend.terms(t), e));
     }
-    for (; i + 4 <= n; i += 4) store_unaligned(to + i, blend(source(i), load_unaligned(to + i)));
-    for (; i < n; ++i) store_one(to + i, blend(source.one(i), load_one(to + i)));
+    for (; i + 4 <= n; i += 4) store_unaligned(to + i, blend(blend.terms(source(i)), load_unaligned(to + i)));
+    for (; i < n; ++i) store_one(to + i, blend(blend.terms(source.one(i)), load_one(to + i)));
   } else {
     draw_run<Blend>(to, n, source);
   }
@@ -324,12 +276,12 @@ VELMARK5_LANE void draw_run_tested(std::uint32_t* to, const float* depth, Float4
     const Int4 passes = less_equal(z, load_unaligned(depth + i));
     if (lane_bits(passes) == 0) continue;
     const Int4 d = load_unaligned(to + i);
-    store_unaligned(to + i, select(passes, blend(source(i), d), d));
+    store_unaligned(to + i, select(passes, blend(blend.terms(source(i)), d), d));
   }
   for (; i < n; ++i) {
     const Int4 passes = less_equal(z, load_one(depth + i));
     const Int4 d = load_one(to + i);
-    store_one(to + i, select(passes, blend(source.one(i), d), d));
+    store_one(to + i, select(passes, blend(blend.terms(source.one(i)), d), d));
   }
 }
 
