@@ -54,11 +54,11 @@ const display_binding& check_new_surface(JNIEnv* env, jobject component, int wid
 
 canvas& canvas_of(JNIEnv* env, jobject peer) { return contract::object(objconvert::get_canvas(env, peer)); }
 
-// A flip makes the canvas's other image the target, whatever the target was: one that described more pixels would be
-// drawn past the image's end.
+// A flip makes the canvas's other image the target under the size and clip rectangle of the last one, even if that is
+// gone by now: where they described more pixels, drawing would go past the image's end.
 void target_fits(const canvas& c) {
   const toolkit& scene = current_toolkit();
-  if (!contract::checked || !c.use_shm || scene.colourbuffer == nullptr) return;
+  if (!contract::checked || !c.use_shm || c.colourbuffer == nullptr) return;
   if (static_cast<long long>(scene.width) * scene.height > static_cast<long long>(c.width) * c.height) {
     contract::fail_state("canvas: %dx%d cannot become the target of %dx%d", c.width, c.height, scene.width,
                          scene.height);

@@ -14,7 +14,7 @@ Java_ea_n(JNIEnv* env, jobject peer, jint, jobject pool, jobjectArray glyphs, ji
     font_natives::check(env, from, font_natives::no_palette);
     auto font = std::make_unique<font_alpha>(&memory);
     font_natives::load_metrics(env, &memory, from, font->metrics);
-    font_natives::load_glyphs(env, &memory, glyphs, font_natives::no_palette, font->glyphs);
+    font_natives::load_glyphs(env, &memory, glyphs, font_natives::no_palette, font->metrics, font->glyphs);
     objconvert::set_font_alpha(env, peer, font.release());
   });
 }

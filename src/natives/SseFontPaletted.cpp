@@ -16,7 +16,7 @@ Java_ia_EA(JNIEnv* env, jobject peer, jint, jobject pool, jobjectArray glyphs, j
     auto font = std::make_unique<font_paletted>(&memory);
     font->palette = copied_jintArrayRO(env, palette).toSharedarray<unsigned int>(&memory);
     font_natives::load_metrics(env, &memory, from, font->metrics);
-    font_natives::load_glyphs(env, &memory, glyphs, palette_length, font->glyphs);
+    font_natives::load_glyphs(env, &memory, glyphs, palette_length, font->metrics, font->glyphs);
     objconvert::set_font_paletted(env, peer, font.release());
   });
 }

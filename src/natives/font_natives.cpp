@@ -42,12 +42,15 @@ void check(JNIEnv* env, const arguments& from, int palette_length) {
   for (int i = 0; i < glyphs; ++i) {
     const local_reference glyph(env, env->GetObjectArrayElement(from.glyphs, i));
     const copied_jbyteArrayRO bytes(env, glyph.bytes());
-    const int length = bytes.length();
+    int drawn = 0;
     if (bytes.array != nullptr && i < sized && widths.elements[i] > 0 && heights.elements[i] > 0) {
       const auto needed = static_cast<long long>(widths.elements[i]) * heights.elements[i];
-      if (length < needed) contract::fail_array("glyphs[%d]: length %d, %lld needed", i, length, needed);
+      if (bytes.length() < needed) {
+        contract::fail_array("glyphs[%d]: length %d, %lld needed", i, bytes.length(), needed);
+      }
+      drawn = static_cast<int>(needed);
     }
-    check_indices(i, reinterpret_cast<const unsigned char*>(bytes.elements), length, palette_length);
+    check_indices(i, reinterpret_cast<const unsigned char*>(bytes.elements), drawn, palette_length);
   }
 }
 
@@ -62,7 +65,8 @@ void load_metrics(JNIEnv* env, memorymanager* pool, const arguments& from, font_
   metrics.x_offsets = x_offsets.toSharedarray<int>(pool);
 }
 
-void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, int palette_length, glyph_bitmaps& glyphs) {
+void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, int palette_length, const font_metrics& metrics,
+                 glyph_bitmaps& glyphs) {
   glyph_bitmaps loaded(env->GetArrayLength(from));
   glyphs.swap(loaded);
   for (int i = 0; i < glyphs.count; ++i) {
@@ -72,7 +76,8 @@ void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, int palett
     const int length = bytes.length();
     glyphs[i] = sharedarray<unsigned char>::allocate(*pool, static_cast<unsigned int>(length));
     std::memcpy(glyphs[i].data(), bytes.elements, static_cast<unsigned int>(length));
-    check_indices(i, glyphs[i].data(), length, palette_length);
+    const glyph::bitmap drawn = glyph_bitmap(glyphs, metrics, static_cast<short>(i));
+    check_indices(i, drawn.bytes, drawn.width * drawn.height, palette_length);
   }
 }
 

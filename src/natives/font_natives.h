@@ -15,7 +15,7 @@ struct arguments {
 };
 
 // Raises when a bitmap is shorter than its width times its height, or uses an index that a palette of palette_length
-// words lacks. A glyph that has no bitmap or no size is left to draw nothing.
+// words lacks. A glyph that has no bitmap or no size is left to draw nothing, and bytes past a bitmap may be anything.
 void check(JNIEnv* env, const arguments& from, int palette_length);
 
 inline constexpr int no_palette = 256;  // longer than every index
@@ -25,7 +25,8 @@ void load_metrics(JNIEnv* env, memorymanager* pool, const arguments& from, font_
 
 // Copies the bitmaps into the pool; a null element stays an empty handle. Indices that a palette of palette_length
 // words lacks raise here too: another thread may have written to the arrays since they were checked.
-void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, int palette_length, glyph_bitmaps& glyphs);
+void load_glyphs(JNIEnv* env, memorymanager* pool, jobjectArray from, int palette_length, const font_metrics& metrics,
+                 glyph_bitmaps& glyphs);
 
 // How a font is found from its peer.
 template <class Font>

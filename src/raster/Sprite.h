@@ -81,6 +81,7 @@ struct Sprite_c {
                     unsigned int stride);
 
   // --- Drawing. The instances of each family are listed in SpriteInstances.h. ------------------------------------
+  // Pixels are read some way ahead of those written: a sprite drawn onto its own pixels leaves undefined ones there.
 
   // As it stands, scaled (nearest sampling), depth-tested or through a mask. Depths are read, never written.
   template <ColourOp_e Op, BlendMode_e Blend, bool Scaled, bool Masked, bool HasColour, bool HasDepth>

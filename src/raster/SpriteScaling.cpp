@@ -12,10 +12,13 @@ struct Margins {
   i64 before, after;
 };
 
-// Margins scale with the image and are cut to whole pixels, each by itself.
+// Margins scale with the image and are cut to whole pixels, each by itself. Margins that cancel the whole image leave
+// no room for it.
 Margins scaled_margins(int before, int stored, int after, int size) {
   if (before == 0 && after == 0) return {0, 0};
-  const long double factor = static_cast<long double>(size) / (i64{before} + stored + after);
+  const i64 full = i64{before} + stored + after;
+  if (full == 0) return {size, 0};
+  const long double factor = static_cast<long double>(size) / full;
   return {sprite_render::truncate(static_cast<long double>(before) * factor),
           sprite_render::truncate(static_cast<long double>(after) * factor)};
 }

@@ -168,8 +168,12 @@ class CanvasWindowTest {
     canvas.present();
     assertArrayEquals(frame, screen(300, 60));
 
-    // Through the peer alone the old target is gone, and drawing without a new one harms nobody.
+    // Through the peer alone the old target is gone, and drawing without a new one harms nobody. Its size is still there.
     canvas.wa(component, 10, 10);
+    toolkit.clearAll(-1);
+    if (shared) {
+      assertThrows(IllegalStateException.class, () -> canvas.H(0, 0, 10, 10));
+    }
     toolkit.clearAll(-1);
   }
 

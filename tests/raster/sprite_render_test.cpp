@@ -17,6 +17,7 @@ void every_pair(sprite_render& scene, const char* name, int calls, bool with_dep
     for (int call = 0; call < calls; ++call) {
       scene.random_target(random, random.between(1, 60), random.between(1, 40), with_depth);
       scene.random_sprite(random, random.between(1, most_pixels), random.between(1, most_pixels), random.one_in(2));
+      if (random.one_in(5)) scene.odd_margins(random);
       const sprite_oracle::modes modes{pair / 3, sprite_scene::random_colour(random), pair % 3};
       draw(random, modes);
       ASSERT_EQ(scene.java.take_exception(), "");

@@ -52,6 +52,20 @@ class sprite_scene : public toolkit_fixture {
     sprite->bottom = image.bottom;
   }
 
+  // Margins of both signs, which often cancel a whole side of the image.
+  void odd_margins(test_random& random) {
+    const auto draw = [&](int stored, int& before, int& after) {
+      before = random.between(-stored - 4, 6);
+      after = random.one_in(3) ? -stored - before : random.between(-stored - 4, 6);
+    };
+    draw(image.width, image.left, image.right);
+    draw(image.height, image.top, image.bottom);
+    sprite->left = image.left;
+    sprite->top = image.top;
+    sprite->right = image.right;
+    sprite->bottom = image.bottom;
+  }
+
   void random_target(test_random& random, int width, int height, bool with_depth) {
     make_target(width, height, true, with_depth);
     for (auto& word : expected.colour = colour.copy()) word = random_colour(random);

@@ -66,9 +66,11 @@ void for_clip(const target& t, Each each) {
 
 // z null: no depth test.
 void scale(target& t, const image& s, const modes& m, int x, int y, int w, int h, const float* z) {
-  if (s.width < 1 || s.height < 1) return;
-  const long double fx = static_cast<long double>(w) / (i64{s.left} + s.width + s.right);
-  const long double fy = static_cast<long double>(h) / (i64{s.top} + s.height + s.bottom);
+  const i64 full_width = i64{s.left} + s.width + s.right;
+  const i64 full_height = i64{s.top} + s.height + s.bottom;
+  if (s.width < 1 || s.height < 1 || full_width == 0 || full_height == 0) return;  // without area
+  const long double fx = static_cast<long double>(w) / full_width;
+  const long double fy = static_cast<long double>(h) / full_height;
   const i64 l = whole(s.left * fx);
   const i64 top = whole(s.top * fy);
   const i64 r = whole(s.right * fx);
@@ -216,8 +218,8 @@ void draw_tiled(target& t, const image& s, const modes& m, int x, int y, int w, 
   t.clip_y1 = static_cast<int>(std::min<i64>(t.clip_y1, i64{y} + h));
   const int full_width = s.left + s.width + s.right;
   const int full_height = s.top + s.height + s.bottom;
-  const int columns = (w + full_width - 1) / full_width;
-  const int rows = (h + full_height - 1) / full_height;
+  const int columns = full_width < 1 ? 0 : (w + full_width - 1) / full_width;
+  const int rows = full_height < 1 ? 0 : (h + full_height - 1) / full_height;
   for (int row = 0; row < rows; ++row) {
     for (int column = 0; column < columns; ++column) {
       draw(t, s, m, x + column * full_width, y + row * full_height, nullptr);

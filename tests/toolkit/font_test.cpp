@@ -199,6 +199,10 @@ TEST_F(font_test, what_is_missing_draws_nothing_and_what_is_wrong_is_refused) {
   bad = load(paletted, {solid}, {5});
   EXPECT_EQ(java.take_exception(),
             "java.lang.ArrayIndexOutOfBoundsException: palette: length 1, but glyphs[0] uses index 1");
+  // Bytes that are never drawn may be anything: past the bitmap, or of a glyph without a size.
+  bad = load(paletted, {{true, 1, 1, 0, 0, {0, 9}}, {true, 0, 4, 0, 0, {9}}}, {5});
+  EXPECT_EQ(java.take_exception(), "");
+  Java_ia_ma(env, bad);
   Java_m_n(env, bad, 0, nullptr, java.new_objects({}), nullptr, nullptr, nullptr, nullptr);
   EXPECT_EQ(java.take_exception(), "java.lang.NullPointerException: ");
   EXPECT_EQ(Java_ja_za(env, peer), before);

@@ -93,7 +93,7 @@ public interface Sprite extends AutoCloseable {
 
   /**
    * Draws the sprite. Like all drawing of sprites this is cut to the toolkit's clip rectangle, and does nothing without a
-   * frame.
+   * frame. Where a sprite is drawn onto its own pixels, while it is the target, they become undefined.
    *
    * @param x left edge of the full image
    * @param y top edge of the full image
@@ -134,8 +134,8 @@ public interface Sprite extends AutoCloseable {
   void draw(int x, int y, ClippingMask mask, int maskX, int maskY);
 
   /**
-   * Draws the sprite turned, sheared and stretched at will, nearest pixels without a filter. One without area draws
-   * nothing.
+   * Draws the sprite turned, sheared and stretched at will, nearest pixels without a filter. Without area, or with 2^19 or
+   * more stored columns or rows, nothing is drawn.
    *
    * @param x0 where the full image's top left corner goes
    * @param y0 where the full image's top left corner goes
@@ -149,7 +149,8 @@ public interface Sprite extends AutoCloseable {
   void drawAcross(float x0, float y0, float x1, float y1, float x2, float y2, Tint tint, BlendMode mode);
 
   /**
-   * Draws the sprite turned, sheared and stretched at will, inside a shape.
+   * Draws the sprite turned, sheared and stretched at will, inside a shape. Without area, or with 2^19 or more stored
+   * columns or rows, nothing is drawn.
    *
    * @param x0 where the full image's top left corner goes
    * @param y0 where the full image's top left corner goes
