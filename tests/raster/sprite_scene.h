@@ -3,19 +3,20 @@
 
 #include <algorithm>
 #include <memory>
+#include <string>
 
 #include "raster/Sprite.h"
+#include "reference/comparison.h"
 #include "reference/sprite_oracle.h"
-#include "support/frame_record.h"
 #include "support/random.h"
 #include "support/toolkit_fixture.h"
 #include "toolkit/clippingmask.h"
 
 class sprite_scene : public toolkit_fixture {
  public:
-  sprite_oracle::image image;
-  sprite_oracle::target expected;
-  sprite_oracle::mask mask;
+  oracle::image image;
+  oracle::target expected;
+  oracle::placed_mask mask;
   std::unique_ptr<Sprite_c> sprite;
   const jobject mask_peer = java.new_object("wa");
 
@@ -31,20 +32,10 @@ class sprite_scene : public toolkit_fixture {
     return word;
   }
 
-  void random_sprite(test_random& random, int width, int height, bool margins) {
-    image = {};
-    if (margins) {
-      image.left = random.between(0, 5);
-      image.top = random.between(0, 5);
-      image.right = random.between(0, 5);
-      image.bottom = random.between(0, 5);
-    }
-    image.width = image.pitch = width;
-    image.height = height;
-    image.pixels.resize(static_cast<std::size_t>(width) * static_cast<std::size_t>(height));
-    for (auto& word : image.pixels) word = random_colour(random);
+  // Both copies from `image`.
+  void make_sprite() {
     sprite = std::make_unique<Sprite_c>();
-    sprite->Allocate(static_cast<unsigned>(width), static_cast<unsigned>(height));
+    sprite->Allocate(static_cast<unsigned>(image.width), static_cast<unsigned>(image.height));
     std::copy(image.pixels.begin(), image.pixels.end(), sprite->pixels);
     sprite->left = image.left;
     sprite->top = image.top;
@@ -52,37 +43,39 @@ class sprite_scene : public toolkit_fixture {
     sprite->bottom = image.bottom;
   }
 
+  void random_sprite(test_random& random, int width, int height, bool margins) {
+    image = {0, 0, 0, 0, width, height, {}};
+    for (int* margin : {&image.left, &image.top, &image.right, &image.bottom}) {
+      if (margins) *margin = random.between(0, 5);
+    }
+    for (int i = 0; i < width * height; ++i) image.pixels.push_back(random_colour(random));
+    make_sprite();
+  }
+
   // Margins of both signs, which often cancel a whole side of the image.
   void odd_margins(test_random& random) {
-    const auto draw = [&](int stored, int& before, int& after) {
+    const auto set = [&](int stored, int& before, int& after) {
       before = random.between(-stored - 4, 6);
       after = random.one_in(3) ? -stored - before : random.between(-stored - 4, 6);
     };
-    draw(image.width, image.left, image.right);
-    draw(image.height, image.top, image.bottom);
-    sprite->left = image.left;
-    sprite->top = image.top;
-    sprite->right = image.right;
-    sprite->bottom = image.bottom;
+    set(image.width, image.left, image.right);
+    set(image.height, image.top, image.bottom);
+    make_sprite();
   }
 
   void random_target(test_random& random, int width, int height, bool with_depth) {
     make_target(width, height, true, with_depth);
-    for (auto& word : expected.colour = colour.copy()) word = random_colour(random);
-    std::copy(expected.colour.begin(), expected.colour.end(), colour.data());
-    expected.depth.clear();
-    if (with_depth) {
-      for (auto& value : expected.depth = depth.copy()) value = static_cast<float>(random.between(-3, 3));
-      std::copy(expected.depth.begin(), expected.depth.end(), depth.data());
-    }
-    expected.width = width;
-    expected.height = height;
+    std::generate_n(colour.data(), colour.elements(), [&] { return random_colour(random); });
+    std::generate_n(depth.data(), depth.elements(), [&] { return static_cast<float>(random.between(-3, 3)); });
     kit().setclipping(random.between(-3, width / 2), random.between(-3, height / 2), random.between(1, width + 3),
                       random.between(1, height + 3));
-    expected.clip_x0 = kit().clip_x0;
-    expected.clip_y0 = kit().clip_y0;
-    expected.clip_x1 = kit().clip_x1;
-    expected.clip_y1 = kit().clip_y1;
+    expect_target();
+  }
+
+  // The reference's copy of the target.
+  void expect_target() {
+    const toolkit& k = kit();
+    expected = {k.width, k.height, colour.copy(), depth.copy(), k.clip_x0, k.clip_y0, k.clip_x1, k.clip_y1};
   }
 
   void random_mask(test_random& random, int width, int height) {
@@ -97,27 +90,17 @@ class sprite_scene : public toolkit_fixture {
     mask.x = random.between(-5, width);
     mask.y = random.between(-5, height);
     Java_wa_ma(env, mask_peer);
-    Java_wa_l(env, mask_peer, 0, pool_peer, mask.width, mask.height,
-              java.new_ints({mask.starts.begin(), mask.starts.end()}),
-              java.new_ints({mask.lengths.begin(), mask.lengths.end()}));
+    Java_wa_l(env, mask_peer, 0, pool_peer, mask.width, mask.height, java.new_ints(mask.starts),
+              java.new_ints(mask.lengths));
   }
 
   // The whole target, colour and depth, and every pixel of the sprite.
   testing::AssertionResult same() {
-    for (int i = 0; i < expected.width * expected.height; ++i) {
-      const auto at = static_cast<std::size_t>(i);
-      if (colour.data()[i] != expected.colour[at]) {
-        return testing::AssertionFailure() << "colour at (" << i % expected.width << ", " << i / expected.width
-                                           << "): " << std::hex << colour.data()[i] << " for " << expected.colour[at];
-      }
-      if (!expected.depth.empty() && depth.data()[i] != expected.depth[at]) {
-        return testing::AssertionFailure() << "depth " << i << " was written";
-      }
-    }
     if (!std::equal(image.pixels.begin(), image.pixels.end(), sprite->pixels)) {
       return testing::AssertionFailure() << "the sprite was written";
     }
-    return testing::AssertionSuccess();
+    const auto same_depth = same_image(depth, expected.depth.data());
+    return same_depth ? same_image(colour, expected.colour.data()) : same_depth;
   }
 
   void record(const std::string& name) { frame_record::add(name.c_str(), colour.data(), colour.elements()); }
