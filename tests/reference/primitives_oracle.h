@@ -2,21 +2,12 @@
 #pragma once
 
 #include <cstdint>
-#include <vector>
 
-// A target with its clip rectangle (right and bottom exclusive). An image that is missing is empty. Operations return
-// false where the library must raise for an unknown mode; nothing is drawn then.
-struct primitives_oracle {
-  struct shape {
-    std::vector<int> starts;
-    std::vector<int> lengths;
-  };
+#include "reference/target.h"
 
-  int width = 0;
-  int height = 0;
-  std::vector<std::uint32_t> colour;
-  std::vector<float> depth;
-  int x0 = 0, y0 = 0, x1 = 0, y1 = 0;
+// Operations return false where the library must raise for an unknown mode; nothing is drawn then.
+struct primitives_oracle : oracle::target {
+  using shape = oracle::shape;
 
   static std::uint32_t combine(std::uint32_t d, std::uint32_t c, unsigned int mode);
 
@@ -32,6 +23,5 @@ struct primitives_oracle {
   void scroll(int dx, int dy);
 
  private:
-  bool in_clip(std::int64_t x, std::int64_t y) const { return x >= x0 && x < x1 && y >= y0 && y < y1; }
   void put(std::int64_t x, std::int64_t y, std::uint32_t c, unsigned int mode);
 };
