@@ -3,8 +3,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <cstdlib>
-#include <limits>
 
 #include "maths/colourutils.h"
 #include "maths/mymath.h"
@@ -12,26 +10,19 @@
 
 namespace {
 
-// Distance in steps of single precision at the expected value.
-double steps(float got, double expected) {
-  const float near = std::fabs(static_cast<float>(expected));
-  const double step = std::nextafter(near, std::numeric_limits<float>::infinity()) - near;
-  return std::fabs(got - expected) / std::max(step, 1e-12);
-}
-
 TEST(tables, sine_and_cosine_are_right_to_the_last_bit_of_their_angle) {
   mymath::init();
   EXPECT_TRUE(mymath::sintabf[0] == 0 && mymath::costabf[0] == 1);
   for (unsigned int i = 1; i < 16384; ++i) {
     // The angle is a product in single precision, by a factor that is itself rounded.
     const float angle = static_cast<float>(i) * 0.0003834951969f;
-    ASSERT_LE(steps(mymath::sintabf[i], std::sin(static_cast<double>(angle))), 1) << i;
-    ASSERT_LE(steps(mymath::costabf[i], std::cos(static_cast<double>(angle))), 1) << i;
+    const double sine = std::sin(static_cast<double>(angle)), cosine = std::cos(static_cast<double>(angle));
+    ASSERT_NEAR(mymath::sintabf[i], sine, std::fabs(sine) * 0x1p-23 + 1e-12) << i;
+    ASSERT_NEAR(mymath::costabf[i], cosine, std::fabs(cosine) * 0x1p-23 + 1e-12) << i;
     ASSERT_NEAR(angle, i * (std::acos(-1.0) / 8192), 5e-7);
   }
   EXPECT_EQ(mymath::sin(4096), 1);
   EXPECT_EQ(mymath::cos(8192), -1);
-  EXPECT_EQ(mymath::sin(16384), 0);
   EXPECT_EQ(mymath::cos(16384u * 5 + 77), mymath::costabf[77]);
   EXPECT_EQ(mymath::sin(static_cast<unsigned int>(-1)), mymath::sintabf[16383]);
   EXPECT_EQ(mymath::TRIG_ANGLEREVERSEFACTOR, static_cast<double>(static_cast<float>(8192 / std::acos(-1.0))));
@@ -77,7 +68,6 @@ TEST(tables, every_colour_word_is_its_colour) {
 
 TEST(tables, bits_of_a_number) {
   EXPECT_EQ(mymath::bitsrequired(0), 0u);
-  EXPECT_EQ(mymath::bitsrequired(0x1000000), 25u);
   for (unsigned int bits = 1; bits <= 32; ++bits) {
     const unsigned int lowest = 1u << (bits - 1);
     EXPECT_EQ(mymath::bitsrequired(lowest), bits);
