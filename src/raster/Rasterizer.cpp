@@ -2,6 +2,10 @@
 
 #include <emmintrin.h>
 
+#include <algorithm>
+
+#include "maths/SSEMath.h"
+
 namespace Rasterizer_n {
 
 unsigned int* m_pColourBuffer = nullptr;
@@ -19,6 +23,18 @@ Viewport_s m_Viewport{};
 Vector4_s m_ViewportMul{};
 Vector4_s m_ViewportAdd{};
 Cliprect_s m_Cliprect{};
+ClipBox_s m_ClipBox{};
+
+namespace {
+
+void recompute_clip_box() {
+  using SSEMath::wrapping_add;
+  m_ClipBox = {std::max(m_Viewport.x, m_Cliprect.x), std::max(m_Viewport.y, m_Cliprect.y),
+               std::min(wrapping_add(m_Viewport.x, m_Viewport.width), wrapping_add(m_Cliprect.x, m_Cliprect.width)),
+               std::min(wrapping_add(m_Viewport.y, m_Viewport.height), wrapping_add(m_Cliprect.y, m_Cliprect.height))};
+}
+
+}  // namespace
 
 void SetViewport(const Viewport_s& viewport) {
   m_Viewport = viewport;
@@ -29,9 +45,13 @@ void SetViewport(const Viewport_s& viewport) {
   m_ViewportAdd = {width * 0.5f + static_cast<float>(viewport.x), height * 0.5f + static_cast<float>(viewport.y),
                    half_depth + viewport.zmin, 0};
   RecomputeCuller();
+  recompute_clip_box();
 }
 
-void SetCliprect(const Cliprect_s& cliprect) { m_Cliprect = cliprect; }
+void SetCliprect(const Cliprect_s& cliprect) {
+  m_Cliprect = cliprect;
+  recompute_clip_box();
+}
 
 void RecomputeCuller() {
   const auto low_word = [](unsigned int value) { return static_cast<std::int16_t>(value); };

@@ -50,12 +50,19 @@ extern Viewport_s m_Viewport;
 extern Vector4_s m_ViewportMul;  // from projected to screen coordinates: scale
 extern Vector4_s m_ViewportAdd;  // and offset
 extern Cliprect_s m_Cliprect;
+
+// Where pixels may be drawn: what the viewport and the clip rectangle have in common. Right and bottom are exclusive.
+struct ClipBox_s {
+  int left, top, right, bottom;
+};
+extern ClipBox_s m_ClipBox;
 #pragma GCC visibility pop
 
-// Stores the viewport and derives m_ViewportMul, m_ViewportAdd and m_TriangleCuller from it.
+// Stores the viewport and derives m_ViewportMul, m_ViewportAdd, m_TriangleCuller and m_ClipBox from it.
 void SetViewport(const Viewport_s& viewport);
 inline const Viewport_s* GetViewport() { return &m_Viewport; }
 
+// Stores the clip rectangle and derives m_ClipBox.
 void SetCliprect(const Cliprect_s& cliprect);
 inline const Cliprect_s* GetCliprect() { return &m_Cliprect; }
 

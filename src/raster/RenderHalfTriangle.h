@@ -243,13 +243,9 @@ void RenderHalfTriangle_c<Shade, AddressU, AddressV, TransformTexCoords, Fog, Bl
     return;
   }
 
-  const int clip_left = m_Viewport.x > m_Cliprect.x ? m_Viewport.x : m_Cliprect.x;
-  const int viewport_right = wrapping_add(m_Viewport.x, m_Viewport.width);
-  const int cliprect_right = wrapping_add(m_Cliprect.x, m_Cliprect.width);
-  const int clip_right = viewport_right < cliprect_right ? viewport_right : cliprect_right;
-
+  const int clip_left = m_ClipBox.left, clip_right = m_ClipBox.right;
   HorizontalLine_s line;
-  const std::ptrdiff_t pitch = m_ScreenPitch;
+  const std::ptrdiff_t pitch = m_ScreenPitch, ahead = 2 * pitch;
   if constexpr (Modes.colour_write) line.colour_row = m_pColourBuffer + first_row * pitch;
   if constexpr (Modes.depth_test) line.depth_row = m_pDepthBuffer + first_row * pitch;
 
@@ -264,8 +260,8 @@ void RenderHalfTriangle_c<Shade, AddressU, AddressV, TransformTexCoords, Fog, Bl
     // Ends to the nearest pixel, clipped.
     const Int4 ends = round(edge);
     const int x0 = lane<0>(ends), x1 = lane<2>(ends);
-    const int start = x0 > clip_left ? x0 : clip_left;
-    const int end = x1 < clip_right ? x1 : clip_right;
+    const int start = std::max(x0, clip_left);
+    const int end = std::min(x1, clip_right);
     if (start < end) {
       const int skip = wrapping_subtract(start, x0);
       const Float4 reciprocal_width = broadcast<0>(reciprocal_estimate(to_float(shuffle<2, 2, 2, 2>(ends) - ends)));
@@ -274,10 +270,14 @@ void RenderHalfTriangle_c<Shade, AddressU, AddressV, TransformTexCoords, Fog, Bl
       if constexpr (Modes.colour_write) {
         address = reinterpret_cast<std::uintptr_t>(line.colour_row + start);
         prefetch_outer(line.colour_row + start);
+        prefetch_outer(line.colour_row + ahead + start);
       } else {
         address = reinterpret_cast<std::uintptr_t>(line.depth_row + start);
       }
-      if constexpr (Modes.depth_test) prefetch_nearer(line.depth_row + start);
+      if constexpr (Modes.depth_test) {
+        prefetch_nearer(line.depth_row + start);
+        prefetch_nearer(line.depth_row + ahead + start);
+      }
       line.start = start;
       line.end = end;
       line.before = static_cast<unsigned int>(address / 4 % 4);

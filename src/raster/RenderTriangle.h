@@ -84,10 +84,8 @@ void RenderTriangle(const Triangle_s& triangle) {
 
   // Clip the rows of both trapezoids. The upper one begins `skip` rows below the top vertex, the lower one `skip_lower`
   // rows below the middle vertex; whichever comes first begins at row `start`.
-  const int clip_top = std::max(m_Viewport.y, m_Cliprect.y);
-  const int clip_bottom =
-      std::min(wrapping_add(m_Viewport.y, m_Viewport.height), wrapping_add(m_Cliprect.y, m_Cliprect.height));
-  const int start = std::max(row_t, clip_top);
+  const int clip_bottom = m_ClipBox.bottom;
+  const int start = std::max(row_t, m_ClipBox.top);
   const int end = std::min(row_m, clip_bottom);
   const int skip = wrapping_subtract(start, row_t);
   const bool has_upper = start < end;
