@@ -183,15 +183,17 @@ VELMARK5_LANE void RenderHLine(HorizontalLine_s& line, const HalfTriangle_s& hal
   const auto advance = [&] { line.template each<Modes>([](auto& running) { running.advance(); }); };
   std::ptrdiff_t x = line.start - static_cast<std::ptrdiff_t>(line.before);
   const auto pixels = static_cast<std::size_t>(line.end - x);  // from the first group's start
-  const std::ptrdiff_t last = x + static_cast<std::ptrdiff_t>((pixels - 1) & ~std::size_t{3});
 
-  // The first group, which may be the last one too: most spans of small triangles end here.
-  const std::size_t cut = 4 - std::min<std::size_t>(pixels, 4);
-  fill_group<Modes, true>(line, half, x, load(UnalignedMasks[1][line.before]) & load(RightClippingMasks[cut]));
-  if (x == last) return;
+  // Most spans of small triangles end in their first group.
+  if (pixels <= 4) {
+    fill_group<Modes, true>(line, half, x, load(UnalignedMasks[1][line.before]) & load(RightClippingMasks[4 - pixels]));
+    return;
+  }
+  fill_group<Modes, true>(line, half, x, load(UnalignedMasks[1][line.before]));
 
   line.template each<Modes>([](auto& running) { running.many(); });
   advance();
+  const std::ptrdiff_t last = x + static_cast<std::ptrdiff_t>((pixels - 1) & ~std::size_t{3});
   for (x += 4; x != last; x += 4) {
     fill_group<Modes, false>(line, half, x, splat(F));
     advance();
