@@ -108,9 +108,9 @@ VELMARK5_LANE void fill_group(const HorizontalLine_s& line, const HalfTriangle_s
   if constexpr (Modes.depth_test) {
     const Int4 passes = less_equal(line.z.value, load(line.depth_row + x));
     mask = Masked ? mask & passes : passes;
-    // A group that fails costs no more. Only the masked groups of plain triangles go on: they cost little more than a
-    // branch that is taken for every other small triangle.
-    if constexpr (!Masked || Modes.textured()) {
+    // A group inside the span that fails costs no more. The groups at its ends go on with an empty mask: small triangles
+    // consist of them, and a branch that waits for the depth and cannot be foreseen costs more than the pixels.
+    if constexpr (!Masked) {
       if (lane_bits(mask) == 0) return;
     }
   }
