@@ -78,6 +78,7 @@ VELMARK5_LANE Float4 select(Int4 mask, Float4 set, Float4 clear) {
   const __m128 m = _mm_castsi128_ps(mask.v);
   return {_mm_or_ps(_mm_and_ps(m, set.v), _mm_andnot_ps(m, clear.v))};
 }
+VELMARK5_LANE Float4 operator&(Float4 a, Int4 mask) { return {_mm_and_ps(a.v, _mm_castsi128_ps(mask.v))}; }
 // Where the mask is set, the lanes of a; the others stay as they are in memory.
 VELMARK5_LANE void store_masked(float* p, Float4 a, Int4 mask) { store(p, select(mask, a, load(p))); }
 

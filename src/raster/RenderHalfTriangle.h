@@ -35,9 +35,10 @@ alignas(16) inline constexpr std::uint32_t RightClippingMasks[4][4] = {
 
 alignas(16) inline constexpr float ZeroOneTwoThree[4] = {0, 1, 2, 3};
 
-// By the pixels of the first group before the span: their number, and the distance of the group's first two pixels from
-// the start of the span, in all channels.
+// By the pixels of the first group before the span: their number, whether there are any, and the distance of the
+// group's first two pixels from the start of the span, in all channels.
 alignas(16) inline constexpr float BackToGroup[4][4] = {{0, 0, 0, 0}, {1, 1, 1, 1}, {2, 2, 2, 2}, {3, 3, 3, 3}};
+alignas(16) inline constexpr std::uint32_t IsBack[4][4] = {{0, 0, 0, 0}, {F, F, F, F}, {F, F, F, F}, {F, F, F, F}};
 alignas(16) inline constexpr std::int16_t PairInGroup[4][8] = {{0, 0, 0, 0, 1, 1, 1, 1},
                                                                {-1, -1, -1, -1, 0, 0, 0, 0},
                                                                {-2, -2, -2, -2, -1, -1, -1, -1},
@@ -108,8 +109,9 @@ VELMARK5_LANE void fill_group(const HorizontalLine_s& line, const HalfTriangle_s
   if constexpr (Modes.depth_test) {
     const Int4 passes = less_equal(line.z.value, load(line.depth_row + x));
     mask = Masked ? mask & passes : passes;
-    // A group inside the span that fails costs no more. The groups at its ends go on with an empty mask: small triangles
-    // consist of them, and a branch that waits for the depth and cannot be foreseen costs more than the pixels.
+    // A group inside the span that fails costs no more. The groups at its ends go on with an empty mask: small
+    // triangles consist of them, and a branch that waits for the depth and cannot be foreseen costs more than the
+    // pixels.
     if constexpr (!Masked) {
       if (lane_bits(mask) == 0) return;
     }
@@ -297,7 +299,10 @@ void RenderHalfTriangle_c<Shade, AddressU, AddressV, TransformTexCoords, Fog, Bl
             first = left + splat(static_cast<float>(skip)) * step;
             first = shuffle<0, 0, 2, 3>(splat(static_cast<float>(z)), first);
           }
-          first = first - load(BackToGroup[line.before]) * step;
+          Float4 back = load(BackToGroup[line.before]) * step;
+          // u/z at depth 0 is infinite, and 0 times that is not a number: nothing to go back is nothing.
+          if constexpr (Modes.textured()) back = back & load(IsBack[line.before]);
+          first = first - back;
           line.z.start(broadcast<1>(first), broadcast<1>(step));
           if constexpr (Modes.textured()) {
             line.u.start(broadcast<2>(first), broadcast<2>(step));

@@ -119,6 +119,7 @@ class Scene {
       v.z = random.one_in(8) ? 1 : random.one_in(8) ? std::max(m_DistanceFogStart, 0.01f) : random.real(0.01f, 1.1f);
     }
     if (random.one_in(4)) t.vertex[1].z = t.vertex[2].z = t.vertex[0].z;
+    if (random.one_in(20)) t.vertex[random.between(0, 2)].z = 0;  // u/z and v/z are infinite
     if (modes.shade == 0) t.flatcolour = random.word();
     if (modes.shade >= 1) colours(t, modes);
     if (modes.shade >= 2) texturing(t, modes);
