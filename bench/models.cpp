@@ -415,8 +415,18 @@ void report_frames(benchmark::State& state, double wall) {
   state.counters["wall_frames/s"] = frames / wall;
 }
 
-void scene_here(benchmark::State& state) {
+// Four lights among the models, or none.
+void scene_here(benchmark::State& state, bool point_lit) {
   models_scene s;
+  if (point_lit) {
+    // x, y, z, range, colour.
+    const int lights[4][5] = {{-500, -200, 900, 800, 0xFFC080},
+                              {600, 100, 1300, 900, 0x80FFC0},
+                              {-300, 300, 1900, 900, 0xC080FF},
+                              {900, -400, 2500, 1000, 0xFFFFFF}};
+    const float strengths[4] = {1, 1, 1, 1};
+    toolkit::m_pInstance->set_pointlights(4, lights[0], strengths);
+  }
   double wall = 0;
   for (auto _ : state) {
     const double wall_begin = wall_seconds(), begin = thread_seconds();
@@ -509,7 +519,10 @@ const bool registered = [] {
     add(
         name + "/out_of_view", [=](benchmark::State& s) { single_models(s, size, fate::out_of_view); }, 20);
   }
-  add("scene/velmark5", scene_here, 10);
+  add(
+      "scene/velmark5", [](benchmark::State& s) { scene_here(s, false); }, 10);
+  add(
+      "scene/velmark5_four_lights", [](benchmark::State& s) { scene_here(s, true); }, 10);
   add("scene/velmark5_two_threads", scene_by_two, 10);
   for (const int bits : {128, 256}) {
     add(

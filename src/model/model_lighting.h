@@ -29,6 +29,19 @@ VELMARK5_LANE unsigned int sunlit(const toolkit& t, unsigned int rgb, unsigned i
          channel(rgb & 0xFF, t.sun_b);
 }
 
+// A vector of each of a face's corners, by lane; the last lane is the third corner again.
+struct corner_vectors {
+  SSEMath::Float4 x, y, z, w;
+};
+
+VELMARK5_LANE corner_vectors by_lane(const Vector4_s& v0, const Vector4_s& v1, const Vector4_s& v2) {
+  using namespace SSEMath;
+  const Float4 p = load(&v0.x), q = load(&v1.x), r = load(&v2.x);
+  const Float4 xy{_mm_unpacklo_ps(p.v, q.v)}, zw{_mm_unpackhi_ps(p.v, q.v)};
+  return {shuffle<0, 1, 0, 0>(xy, r), shuffle<2, 3, 1, 1>(xy, r), shuffle<0, 1, 2, 2>(zw, r),
+          shuffle<2, 3, 3, 3>(zw, r)};
+}
+
 // The sun as the corners of many faces need it, read from the scene once.
 class sun {
  public:
@@ -43,15 +56,10 @@ class sun {
                                                   static_cast<std::uint32_t>(t.sun_g) << 8 | t.sun_b))),
         scene_(t) {}
 
-  // sun_intensity of three normals at once; the last lane is that of the third again.
-  VELMARK5_LANE SSEMath::Int4 intensities(const Vector4_s& n0, const Vector4_s& n1, const Vector4_s& n2,
-                                          SSEMath::Float4 contrastfactor) const {
+  // sun_intensity of three normals at once.
+  VELMARK5_LANE SSEMath::Int4 intensities(const corner_vectors& normals, SSEMath::Float4 contrastfactor) const {
     using namespace SSEMath;
-    const Float4 p = load(&n0.x), q = load(&n1.x), r = load(&n2.x);
-    const Float4 xy_pq{_mm_unpacklo_ps(p.v, q.v)}, zw_pq{_mm_unpackhi_ps(p.v, q.v)};
-    const Float4 x = shuffle<0, 1, 0, 0>(xy_pq, r), y = shuffle<2, 3, 1, 1>(xy_pq, r);
-    const Float4 z = shuffle<0, 1, 2, 2>(zw_pq, r), w = shuffle<2, 3, 3, 3>(zw_pq, r);
-    const Float4 d{_mm_div_ps((x_ * x + y_ * y + z_ * z).v, w.v)};
+    const Float4 d{_mm_div_ps((x_ * normals.x + y_ * normals.y + z_ * normals.z).v, normals.w.v)};
     const Float4 side = select(less(splat(0.0f), d), front_, back_);
     return truncate((ambient_ + d * side * contrastfactor) * splat(256.0f));
   }
@@ -123,5 +131,49 @@ VELMARK5_LANE unsigned int pointlit(const toolkit& t, const Vector4_s* lightpos,
   const __m128i words = _mm_packs_epi32(rounded, rounded);
   return static_cast<unsigned int>(_mm_cvtsi128_si32(_mm_packus_epi16(words, words)));
 }
+
+// The point lights as the corners of many faces need them. lightpos: in model space, as the scene counts them.
+class point_lights {
+ public:
+  point_lights(const toolkit& t, const Vector4_s* lightpos) : count_(t.pointlight_count) {
+    using namespace SSEMath;
+    for (int i = 0; i < count_; ++i) {
+      const Int4 word = splat(t.pointlight_colour[i]);
+      lights_[i] = {splat(lightpos[i].x), splat(lightpos[i].y), splat(lightpos[i].z), splat(t.pointlight_strength[i]),
+                    to_float(integers_low(widen_low(word)))};
+    }
+  }
+
+  // pointlit of three corners at once. Takes and returns channels times 256, of the first two corners and of the third.
+  VELMARK5_LANE SSEMath::Channels corners(SSEMath::Channels sunlit, const corner_vectors& positions,
+                                          const corner_vectors& normals) const {
+    using namespace SSEMath;
+    const Word8 two = shift_right<8>(sunlit.low), third = shift_right<8>(sunlit.high);
+    Float4 sum0 = to_float(integers_low(two)), sum1 = to_float(integers_high(two));
+    Float4 sum2 = to_float(integers_low(third));
+    const Float4 scale = splat(1.5259022e-5f);
+    const Float4 reflected0 = scale * sum0, reflected1 = scale * sum1, reflected2 = scale * sum2;
+    for (int i = 0; i < count_; ++i) {
+      const light& from = lights_[i];
+      const Float4 dx = from.x - positions.x, dy = from.y - positions.y, dz = from.z - positions.z;
+      const Float4 squared = dx * dx + dy * dy + dz * dz;
+      const Float4 facing = max(dx * normals.x + dy * normals.y + dz * normals.z, splat(0.0f));
+      const Float4 strength = facing * from.strength * reciprocal_estimate(squared) * reciprocal_root_estimate(squared);
+      sum0 += from.colour * reflected0 * broadcast<0>(strength);
+      sum1 += from.colour * reflected1 * broadcast<1>(strength);
+      sum2 += from.colour * reflected2 * broadcast<2>(strength);
+    }
+    const Int4 third_channels = round(sum2);
+    return widen_shifted(
+        narrow({signed_words(round(sum0), round(sum1)), signed_words(third_channels, third_channels)}));
+  }
+
+ private:
+  struct light {
+    SSEMath::Float4 x, y, z, strength, colour;
+  };
+  light lights_[4];
+  int count_;
+};
 
 }  // namespace lighting

@@ -5,6 +5,7 @@
 
 #include <bit>
 #include <cstdint>
+#include <type_traits>
 
 #include "model/model.h"
 #include "model/model_culling.h"
@@ -25,6 +26,7 @@ class face_drawer {
         sunlight(scene),
         flat_factor(SSEMath::splat(512.0f / static_cast<float>(drawn.contrast))),
         smooth_factor(SSEMath::splat(768.0f / static_cast<float>(drawn.contrast))),
+        lights(scene, drawn.lightpos),
         textured_faces(scene.textures != nullptr ? drawn.texfacecount : 0) {
     if constexpr (HEIGHTFOG) triangle.fogcolour = Rasterizer_n::m_HeightFogColour;
   }
@@ -199,18 +201,11 @@ class face_drawer {
     const Vector4_s& na = smooth ? vertex_normal(a) : fnormal[f];
     const Vector4_s& nb = smooth ? vertex_normal(b) : na;
     const Vector4_s& nc = smooth ? vertex_normal(c) : na;
-    const SSEMath::Int4 intensities = sunlight.intensities(na, nb, nc, smooth ? smooth_factor : flat_factor);
-    const SSEMath::Channels sunlit = sunlight.corners(colours_of(f), intensities);
-    if constexpr (!POINTLIT) {
-      set_colours(sunlit);
-    } else {
-      alignas(16) unsigned int words[4];
-      SSEMath::store(words, SSEMath::narrow(SSEMath::shift_right<8>(sunlit)));
-      words[0] = lighting::pointlit(scene, mesh.lightpos, words[0], vpos[a], na);
-      words[1] = lighting::pointlit(scene, mesh.lightpos, words[1], vpos[b], nb);
-      words[2] = lighting::pointlit(scene, mesh.lightpos, words[2], vpos[c], nc);
-      set_colours(SSEMath::widen_shifted(SSEMath::load(words)));
-    }
+    const lighting::corner_vectors normals = lighting::by_lane(na, nb, nc);
+    const SSEMath::Int4 intensities = sunlight.intensities(normals, smooth ? smooth_factor : flat_factor);
+    SSEMath::Channels lit = sunlight.corners(colours_of(f), intensities);
+    if constexpr (POINTLIT) lit = lights.corners(lit, lighting::by_lane(vpos[a], vpos[b], vpos[c]), normals);
+    set_colours(lit);
   }
 
   // What all faces with the texture have in common.
@@ -281,6 +276,10 @@ class face_drawer {
   const toolkit& scene;
   const lighting::sun sunlight;
   const SSEMath::Float4 flat_factor, smooth_factor;
+  struct no_lights {
+    no_lights(const toolkit&, const Vector4_s*) {}
+  };
+  const std::conditional_t<POINTLIT, lighting::point_lights, no_lights> lights;
 
   const unsigned short *fa, *fb, *fc, *ftex;
   const face_colours* fcolours;

@@ -35,7 +35,8 @@ TEST_F(model_lighting_test, three_corners_at_once_are_lit_as_each_alone) {
     const float contrast = random.real(0, 3);
     alignas(16) unsigned int words[4] = {random.word(), random.word(), random.word(), 0}, lit[4];
     const lighting::sun sun(t);
-    const auto intensities = sun.intensities(normal[0], normal[1], normal[2], SSEMath::splat(contrast));
+    const auto intensities =
+        sun.intensities(lighting::by_lane(normal[0], normal[1], normal[2]), SSEMath::splat(contrast));
     const auto channels = sun.corners(SSEMath::load(words), intensities);
     SSEMath::store(lit, SSEMath::narrow(SSEMath::shift_right<8>(channels)));
     for (int k = 0; k < 3; ++k) {
