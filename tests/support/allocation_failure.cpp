@@ -32,6 +32,10 @@ void allocation_failure::move_realloc(bool move, unsigned int phase) {
   realloc_moves = move;
   realloc_phase = phase;
 }
+void allocation_failure::none() {
+  memalign_countdown = 0;
+  realloc_fails = realloc_moves = false;
+}
 
 // operator new(size_t), by its name in each word size.
 #ifdef __x86_64__
@@ -44,8 +48,12 @@ extern "C" {
 
 void* __real_malloc(std::size_t size);
 void* VELMARK5_NEW(__real_)(std::size_t size);
+int __real_posix_memalign(void** out, std::size_t alignment, std::size_t size);
+void* __real_realloc(void* p, std::size_t size);
 void* __wrap_malloc(std::size_t size);
 void* VELMARK5_NEW(__wrap_)(std::size_t size);
+int __wrap_posix_memalign(void** out, std::size_t alignment, std::size_t size);
+void* __wrap_realloc(void* p, std::size_t size);
 
 void* __wrap_malloc(std::size_t size) {
   ++allocations;
@@ -55,11 +63,6 @@ void* VELMARK5_NEW(__wrap_)(std::size_t size) {
   ++allocations;
   return VELMARK5_NEW(__real_)(size);
 }
-
-int __real_posix_memalign(void** out, std::size_t alignment, std::size_t size);
-void* __real_realloc(void* p, std::size_t size);
-int __wrap_posix_memalign(void** out, std::size_t alignment, std::size_t size);
-void* __wrap_realloc(void* p, std::size_t size);
 
 int __wrap_posix_memalign(void** out, std::size_t alignment, std::size_t size) {
   ++allocations;

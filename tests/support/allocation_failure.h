@@ -16,4 +16,7 @@ void fail_realloc(bool fail);
 // Every realloc moves the block, while set, to an address that is `phase` (a multiple of 16) beyond a multiple of 128.
 void move_realloc(bool move, unsigned int phase = 16);
 
+// Back to allocations as the system makes them.
+void none();
+
 }  // namespace allocation_failure

@@ -10,6 +10,7 @@
 
 #include <jni.h>
 
+#include <cstring>
 #include <deque>
 #include <functional>
 #include <map>
@@ -17,6 +18,7 @@
 #include <mutex>
 #include <string>
 #include <thread>
+#include <typeinfo>
 #include <vector>
 
 struct fake_object;
@@ -40,18 +42,23 @@ class fake_java {
   void set_nativeid(jobject object, jlong value);
   void collect(jobject object);  // clears the weak references to it, as the garbage collector does
 
-  jintArray new_ints(const std::vector<jint>& values);
-  jshortArray new_shorts(const std::vector<jshort>& values);
-  jbyteArray new_bytes(const std::vector<jbyte>& values);
-  jbooleanArray new_booleans(const std::vector<jboolean>& values);
-  jfloatArray new_floats(const std::vector<jfloat>& values);
-  jobjectArray new_objects(const std::vector<jobject>& values);
+  jintArray new_ints(const std::vector<jint>& values) { return new_array<jintArray>(values); }
+  jshortArray new_shorts(const std::vector<jshort>& values) { return new_array<jshortArray>(values); }
+  jbyteArray new_bytes(const std::vector<jbyte>& values) { return new_array<jbyteArray>(values); }
+  jfloatArray new_floats(const std::vector<jfloat>& values) { return new_array<jfloatArray>(values); }
+  jobjectArray new_objects(const std::vector<jobject>& values) { return new_array<jobjectArray>(values); }
+  template <class Array, class T>
+  Array new_array(const std::vector<T>& values) {
+    return static_cast<Array>(make_array(typeid(T), values.data(), values.size(), sizeof(T)));
+  }
 
-  std::vector<jint> ints(jintArray array) const;
-  std::vector<jshort> shorts(jshortArray array) const;
-  std::vector<jbyte> bytes(jbyteArray array) const;
-  std::vector<jboolean> booleans(jbooleanArray array) const;
-  std::vector<jfloat> floats(jfloatArray array) const;
+  std::vector<jint> ints(jintArray array) const { return contents<jint>(array); }
+  template <class T>
+  std::vector<T> contents(jarray array) const {
+    std::vector<T> values(bytes_of(array).size() / sizeof(T));
+    if (!values.empty()) std::memcpy(values.data(), bytes_of(array).data(), bytes_of(array).size());
+    return values;
+  }
 
   // --- The client's callbacks, on class "ja"; unset ones answer false and null ------------------------------------
 
@@ -64,19 +71,17 @@ class fake_java {
   // What Throwable.toString() gives of the pending exception, which is cleared: "java.lang.Error: text", or just the
   // class where the message is null. "" when there is none.
   std::string take_exception();
-  void raise(const char* class_name, const char* message);  // as a callback would
+  void raise(const std::string& class_name, const std::string& message);  // as a callback would
 
   // --- What was seen ------------------------------------------------------------------------------------------------
 
   // Reports as test failures, and forgets: violations, arrays not given back, monitors held, a pending exception.
   void verify();
-  std::vector<std::string> take_violations();
 
-  int calls(const std::string& function) const;  // since the start, over all threads
-  const std::vector<std::string>& log() const { return history; }
-  void clear_log() { history.clear(); }
+  const std::vector<std::string>& log() const { return history; }  // the functions called, over all threads
+  int calls(const std::string& function) const;
   int weak_references() const { return live_weak; }
-  int arrays_out() const;  // handed out, not given back
+  int arrays_out() const { return static_cast<int>(out.size()); }  // handed out, not given back
 
   // Makes NewIntArray, Get<Type>ArrayElements and GetPrimitiveArrayCritical, counted together, number `n` from now
   // answer null with an OutOfMemoryError pending; 0 for none.
@@ -84,6 +89,8 @@ class fake_java {
 
  private:
   friend struct fake_calls;
+  template <auto Function>
+  friend struct slot;
 
   struct handed_out {
     fake_object* array;
@@ -92,15 +99,14 @@ class fake_java {
     JNIEnv* owner;
   };
 
-  void violation(const std::string& text);
+  void violation(const std::string& text) { violations.push_back(text); }
   fake_object* make(const std::string& class_name);
-  template <class Array, class T>
-  Array make_array(const char* class_name, const std::vector<T>& values);
-  void enter(JNIEnv* caller, const char* function, bool legal_with_exception = false, bool legal_when_pinned = false);
-  void* hand_out(JNIEnv* caller, jobject array, bool critical, const char* type);
-  void give_back(JNIEnv* caller, jobject array, void* elements, jint mode, bool critical);
-  bool out_of_memory(JNIEnv* caller);
-  void throw_object(JNIEnv* caller, fake_object* exception);
+  jobject make_array(const std::type_info& element, const void* elements, std::size_t count, std::size_t element_size);
+  const std::vector<unsigned char>& bytes_of(jarray array) const;
+  void enter(JNIEnv* caller, const char* function, unsigned int rules);
+  void* hand_out(jarray array, const std::type_info& type);
+  void give_back(jarray array, void* elements, jint mode, bool critical);
+  bool out_of_memory();
 
   mutable std::recursive_mutex lock;
   JNIInvokeInterface_ vm_functions{};
@@ -109,7 +115,6 @@ class fake_java {
   std::deque<std::unique_ptr<fake_object>> objects;
   std::map<std::string, fake_object*> classes;
   std::map<void*, handed_out> out;
-  std::map<std::string, int> call_counts;
   std::vector<std::string> history;
   std::vector<std::string> violations;
   int live_weak = 0;

@@ -3,16 +3,26 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdint>
+#include <functional>
+#include <initializer_list>
 #include <string>
 #include <vector>
 
 #include "natives/jniarray.h"
 #include "raster/Rasterizer.h"
+#include "support/allocation_failure.h"
 #include "support/natives.h"
 #include "support/recording_jni.h"
 #include "toolkit/toolkit.h"
 #include "util/memorymanager/memorymanager.h"
+
+// What the exceptions of refused calls read like; texts of the classes' own may follow.
+inline const std::string null_pointer = "java.lang.NullPointerException: ";
+inline const std::string bad_argument = "java.lang.IllegalArgumentException: ";
+inline const std::string out_of_bounds = "java.lang.ArrayIndexOutOfBoundsException: ";
+inline const std::string no_memory = "java.lang.RuntimeException: Cannot allocate memory";
 
 // An image of 32-bit elements, 16-byte aligned, between guard words.
 template <class T>
@@ -73,6 +83,7 @@ class toolkit_fixture : public testing::Test {
   }
 
   void TearDown() override {
+    allocation_failure::none();
     EXPECT_TRUE(colour.intact()) << "a write outside the colour target";
     EXPECT_TRUE(depth.intact()) << "a write outside the depth target";
     EXPECT_EQ(java.take_exception(), "");
@@ -90,6 +101,28 @@ class toolkit_fixture : public testing::Test {
   template <class T>
   T* native(jobject object) const {
     return reinterpret_cast<T*>(static_cast<std::intptr_t>(java.nativeid(object)));
+  }
+
+  // What Java sees of a call: its exception, or "".
+  std::string raised(const std::function<void()>& call) {
+    call();
+    return java.take_exception();
+  }
+  // Each of the calls raises an exception that starts like this.
+  void expect_raised(const std::string& exception, std::initializer_list<std::function<void()>> calls) {
+    int number = 0;
+    for (const auto& call : calls) {
+      const std::string text = raised(call);
+      EXPECT_EQ(text.substr(0, exception.size()), exception) << text << " of call " << number;
+      ++number;
+    }
+  }
+
+  // A span mask in the pool, with the same width and height for all.
+  jobject new_mask(const std::vector<jint>& starts, const std::vector<jint>& lengths) {
+    const jobject mask = java.new_object("wa");
+    Java_wa_l(env, mask, 0, pool_peer, 40, 40, java.new_ints(starts), java.new_ints(lengths));
+    return mask;
   }
 
   // A target of this size in `colour` and `depth`, both zero, with clip rectangle and viewport over all of it.
