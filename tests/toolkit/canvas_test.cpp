@@ -409,33 +409,29 @@ TEST_F(canvas_test, natives_check_the_flipped_rectangle_and_take_back_the_target
 TEST_F(canvas_test, a_flip_under_the_size_of_a_larger_target_is_refused) {
   objconvert::set_canvas(env, canvas_peer, make().release());
   const jobject sprite = java.new_object("fa"), depths = java.new_object("oa");
+  const auto end_sprite = [&] { Java_fa_M(env, sprite, java.nativeid(sprite)); };
   const auto to_sprite = [&](int height) {
-    Java_fa_M(env, sprite, java.nativeid(sprite));
+    end_sprite();
     Java_fa_UA(env, sprite, 0, w, height);
     Java_ja_d(env, peer, java.nativeid(sprite), 0);
   };
   Java_oa_g(env, depths, w, h + 1);
-  const std::map<std::string, std::function<void()>> setups{
-      {"a depth image alone", [&] { Java_ja_d(env, peer, 0, java.nativeid(depths)); }},
-      {"a sprite, then nothing", [&] { to_sprite(h + 1), Java_ja_d(env, peer, 0, 0); }},
-      {"a sprite that is gone", [&] { to_sprite(h + 1), Java_fa_M(env, sprite, java.nativeid(sprite)); }},
-      {"a sprite", [&] { to_sprite(h + 1); }}};
-  for (const auto& [name, set_up] : setups) {
-    SCOPED_TRACE(name);
+  const std::function<void()> larger[] = {[&] { Java_ja_d(env, peer, 0, java.nativeid(depths)); },  // depth alone
+                                          [&] { to_sprite(h + 1), Java_ja_d(env, peer, 0, 0); },    // then nothing
+                                          [&] { to_sprite(h + 1), end_sprite(); }, [&] { to_sprite(h + 1); }};
+  for (const auto& set_up : larger) {
     Java_ja_PA(env, peer, canvas_peer);
     set_up();
     const unsigned int* const target = kit().colourbuffer;
-    forget_calls();
-    Java_za_H(env, canvas_peer, 0, 0, w, h);
-    EXPECT_EQ(java.take_exception(),
-              "java.lang.IllegalStateException: canvas: 30x20 cannot become the target of 30x21");
+    failing({});
+    expect_raised("java.lang.IllegalStateException: canvas: 30x20 cannot become the target of 30x21",
+                  {[&] { Java_za_H(env, canvas_peer, 0, 0, w, h); }});
     expect_calls({});
     EXPECT_EQ(kit().colourbuffer, target);
     to_sprite(h);
-    Java_za_H(env, canvas_peer, 0, 0, w, h);
-    EXPECT_EQ(java.take_exception(), "") << "a target of the canvas's size";
+    EXPECT_EQ(raised([&] { Java_za_H(env, canvas_peer, 0, 0, w, h); }), "") << "a target of the canvas's size";
   }
-  Java_fa_M(env, sprite, java.nativeid(sprite));
+  end_sprite();
   Java_oa_za(env, depths, java.nativeid(depths));
   Java_za_ma(env, canvas_peer);
   desktop.expect_nothing_held();
