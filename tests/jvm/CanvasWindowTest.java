@@ -168,7 +168,8 @@ class CanvasWindowTest {
     canvas.present();
     assertArrayEquals(frame, screen(300, 60));
 
-    // Through the peer alone the old target is gone, and drawing without a new one harms nobody. Its size is still there.
+    // Through the peer alone the old target is gone, and drawing without a new one harms nobody. Its size
+    // is still there.
     canvas.wa(component, 10, 10);
     toolkit.clearAll(-1);
     if (shared) {

@@ -134,8 +134,8 @@ public interface Sprite extends AutoCloseable {
   void draw(int x, int y, ClippingMask mask, int maskX, int maskY);
 
   /**
-   * Draws the sprite turned, sheared and stretched at will, nearest pixels without a filter. Without area, or with 2^19 or
-   * more stored columns or rows, nothing is drawn.
+   * Draws the sprite turned, sheared and stretched at will, nearest pixels without a filter. Without area, or with 2^19
+   * or more stored columns or rows, nothing is drawn.
    *
    * @param x0 where the full image's top left corner goes
    * @param y0 where the full image's top left corner goes
