@@ -1,203 +1,242 @@
-import static org.junit.jupiter.api.Assertions.assertArrayEquals;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertFalse;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
+import java.awt.Component;
 import java.awt.Dimension;
+import java.awt.EventQueue;
 import java.awt.Frame;
 import java.awt.Point;
 import java.awt.Rectangle;
 import java.awt.Robot;
 import java.awt.event.WindowEvent;
-import java.awt.image.BufferedImage;
 import java.nio.file.Files;
 import java.nio.file.Path;
+import java.util.Arrays;
+import java.util.List;
 import java.util.Random;
 import java.util.concurrent.CompletableFuture;
 import java.util.concurrent.TimeUnit;
 import javax.imageio.ImageIO;
+import javax.swing.JPanel;
 import org.junit.jupiter.api.AfterEach;
 import org.junit.jupiter.api.BeforeEach;
 import org.junit.jupiter.api.Tag;
 import org.junit.jupiter.api.Test;
-import velmark5.BlendMode;
-import velmark5.Canvas;
 import velmark5.Rect;
 import velmark5.Sprite;
 import velmark5.Toolkit;
 import velmark5.demo.Demo;
 
-/** Canvases in a real window; what arrived on the screen is read back. */
+/** Frames in a real window, read back from the screen, with and without shared memory. */
 @Tag("window")
 class WindowTest {
-  private static final int WIDTH = 93;
-  private static final int HEIGHT = 61;
-  private static final int RGB = 0xFFFFFF;
+  private static final int W = 203;
+  private static final int H = 117;
 
-  private Toolkit toolkit;
+  /** How many segments a canvas has: none on a display that shares no memory. */
+  private final int each = Boolean.getBoolean("velmark5.test.shm") ? 2 : 0;
+
+  private final Random random = new Random(20);
+  private Robot robot;
   private Frame window;
   private java.awt.Canvas component;
-  private long ownOfAwt;
+  private Toolkit toolkit;
+  private za canvas;
 
   @BeforeEach
   void open() throws Exception {
-    toolkit = Toolkit.create();
+    robot = new Robot();
     component = new java.awt.Canvas();
     component.setIgnoreRepaint(true);
-    component.setPreferredSize(new Dimension(300, 200));
+    component.setPreferredSize(new Dimension(W, H));
     window = new Frame();
     window.setUndecorated(true);
     window.add(component);
     window.pack();
+    window.setLocation(40, 30);
     window.setVisible(true);
-    // Reading the screen makes AWT share memory with the display too, and keep it.
-    screen(1, 1);
-    ownOfAwt = segments();
+    settle();
+    toolkit = Toolkit.create();
+    canvas = (za) toolkit.createCanvas(component, W, H);
+    toolkit.drawTo(canvas);
   }
 
   @AfterEach
   void close() throws Exception {
     toolkit.close();
-    window.dispose();
+    EventQueue.invokeAndWait(window::dispose);
     assertSegments(0);
   }
 
-  /** Segments of shared memory that this process made. */
-  private static long segments() throws Exception {
-    try (var lines = Files.lines(Path.of("/proc/sysvipc/shm"))) {
-      long self = ProcessHandle.current().pid();
-      return lines.skip(1).filter(line -> Long.parseLong(line.trim().split("\\s+")[4]) == self).count();
-    }
+  /** Lets the window appear, and be painted by AWT for the last time. */
+  private void settle() throws Exception {
+    robot.waitForIdle();
+    java.awt.Toolkit.getDefaultToolkit().sync();
+    Thread.sleep(150);
   }
 
-  /** How many segments there are besides AWT's own; the display may let go of one a little later. */
-  private void assertSegments(long expected) throws Exception {
-    for (int i = 0; i < 100 && segments() - ownOfAwt != expected; i++) {
-      Thread.sleep(20);
-    }
-    assertEquals(expected, segments() - ownOfAwt, "shared memory segments of this process");
+  /** Draws noise, from the top left of the target, and returns it. */
+  private int[] draw(int width, int height) {
+    int[] noise = random.ints((long) width * height, 0, 1 << 24).toArray();
+    toolkit.writeArea(new Rect(0, 0, width, height), noise, 0, width);
+    return noise;
   }
 
-  private int[] screen(int width, int height) throws Exception {
+  private int[] backBuffer() {
+    return toolkit.readArea(new Rect(0, 0, W, H));
+  }
+
+  private int[] screen(int width, int height) {
+    java.awt.Toolkit.getDefaultToolkit().sync();
     Point at = component.getLocationOnScreen();
-    BufferedImage image = new Robot().createScreenCapture(new Rectangle(at.x, at.y, width, height));
-    return rgb(image.getRGB(0, 0, width, height, null, 0, width));
+    var seen = robot.createScreenCapture(new Rectangle(at.x, at.y, width, height));
+    return Arrays.stream(seen.getRGB(0, 0, width, height, null, 0, width)).map(pixel -> pixel & 0xFFFFFF).toArray();
   }
 
-  private static int[] rgb(int[] words) {
-    int[] result = words.clone();
-    for (int i = 0; i < result.length; i++) {
-      result[i] &= RGB;
-    }
-    return result;
+  /** The segments that canvases of this process hold, as permissions in octal; 1000 marks for removal. */
+  private static List<String> segments() throws Exception {
+    String pid = Long.toString(ProcessHandle.current().pid());
+    return Files.readAllLines(Path.of("/proc/sysvipc/shm")).stream()
+        .map(line -> line.trim().split(" +"))
+        .filter(columns -> columns[4].equals(pid) && columns[2].endsWith("777"))
+        .map(columns -> columns[2])
+        .toList();
   }
 
-  /** The first present may meet a window that is not yet on the screen, so it is repeated until it shows. */
-  private void assertShows(int[] expected, int width, int height, Runnable draw) throws Exception {
-    int[] seen = {};
-    for (int i = 0; i < 50; i++) {
-      draw.run();
-      seen = screen(width, height);
-      if (java.util.Arrays.equals(expected, seen)) {
-        return;
-      }
-      Thread.sleep(20);
+  private static void assertSegments(int count) throws Exception {
+    for (int attempt = 0; segments().size() != count && attempt < 50; ++attempt) {
+      Thread.sleep(20); // the display server lets go of its side when it gets to it
     }
-    assertArrayEquals(expected, seen);
+    assertEquals(count, segments().size(), "shared segments");
   }
 
   @Test
-  void framesArriveOnTheScreen() throws Exception {
-    Canvas canvas = toolkit.createCanvas(component, WIDTH, HEIGHT);
-    toolkit.drawTo(canvas);
-    Rect all = new Rect(0, 0, WIDTH, HEIGHT);
-    assertArrayEquals(new int[WIDTH * HEIGHT], toolkit.readArea(all));
-    for (int seed = 0; seed < 4; seed++) {
-      int[] picture = new Random(seed).ints(WIDTH * HEIGHT).toArray();
-      assertShows(rgb(picture), WIDTH, HEIGHT, () -> {
-        toolkit.writeArea(all, picture, 0, WIDTH);
-        canvas.present();
-      });
-    }
+  void framesReachTheScreenPixelByPixel() {
+    assertArrayEquals(new int[W * H], backBuffer(), "a canvas that becomes the target is black");
+    int[] older = draw(W, H);
+    canvas.present();
+    assertArrayEquals(older, screen(W, H));
+    int[] newer = draw(W, H);
+    canvas.present();
+    assertArrayEquals(newer, screen(W, H));
+
+    // Two images in turn, or the only one.
+    int[] next = each == 2 ? older : newer;
+    assertArrayEquals(next, backBuffer());
+    canvas.present();
+    assertArrayEquals(next, screen(W, H));
+    assertArrayEquals(newer, backBuffer());
   }
 
   @Test
-  void aPartIsShownAtTheTopLeft() throws Exception {
-    Canvas canvas = toolkit.createCanvas(component, WIDTH, HEIGHT);
-    Rect part = new Rect(40, 20, 30, 25);
-    assertShows(new int[] {0x112233}, 1, 1, () -> {
-      toolkit.drawTo(canvas);
-      toolkit.clear(0x112233);
-      canvas.present();
-      toolkit.clear(0x445566);
-      toolkit.fillRect(part, 0x778899, BlendMode.REPLACE);
-      ((za) canvas).CA(1, 2, 3, 4, 5, 6);
-    });
-    int[] expected = new int[WIDTH * HEIGHT];
-    for (int i = 0; i < expected.length; i++) {
-      expected[i] = i % WIDTH < 30 && i / WIDTH < 25 ? 0x778899 : 0x112233;
+  void partsOfAFrameShowAtTheTopLeft() {
+    canvas.present();
+    int[] frame = draw(W, H);
+    int[] expected = new int[W * H];
+    for (int row = 0; row < 50; ++row) {
+      System.arraycopy(frame, (60 + row) * W + 100, expected, row * W, 103);
     }
-    canvas.present(part);
-    assertShows(expected, WIDTH, HEIGHT, () -> {});
+    canvas.present(new Rect(100, 60, 103, 50));
     canvas.present(new Rect(5, 5, 0, 9));
-    assertThrows(IllegalArgumentException.class, () -> canvas.present(new Rect(64, 0, 30, 1)));
+    assertArrayEquals(expected, screen(W, H));
+    frame = draw(W, H);
+    canvas.CA(0, 0, W, H, 0, 0);
+    assertArrayEquals(expected, screen(W, H), "dirty rectangles show nothing");
+    assertThrows(IllegalArgumentException.class, () -> canvas.present(new Rect(1, 0, W, H)));
+    assertThrows(IllegalArgumentException.class, () -> canvas.H(0, 0, -1, 1));
+    assertArrayEquals(frame, backBuffer(), "and change no buffer");
   }
 
   @Test
-  void resizingKeepsTheTarget() throws Exception {
-    Canvas canvas = toolkit.createCanvas(component, WIDTH, HEIGHT);
-    toolkit.drawTo(canvas);
-    toolkit.clear(-1);
+  void resizingMovesToNewBuffers() throws Exception {
+    EventQueue.invokeAndWait(
+        () -> {
+          component.setPreferredSize(new Dimension(300, 60));
+          window.pack();
+        });
+    settle();
     toolkit.setClip(new Rect(1, 1, 1, 1));
-    canvas.resize(200, 31);
-    assertEquals(new Rect(0, 0, 200, 31), toolkit.clip());
-    assertEquals(new Rect(0, 0, 200, 31), toolkit.viewport());
-    assertEquals(200, canvas.width());
-    int[] expected = new int[200 * 31];
-    java.util.Arrays.fill(expected, 0x00AB1234);
-    assertShows(expected, 200, 31, () -> {
-      toolkit.clear(0x00AB1234);
-      canvas.present();
-    });
+    canvas.resize(300, 60);
+    assertSegments(each);
+    assertEquals(300, canvas.width());
+    assertEquals(new Rect(0, 0, 300, 60), toolkit.clip());
+    assertEquals(new Rect(0, 0, 300, 60), toolkit.viewport());
+    int[] frame = draw(300, 60);
+    canvas.present();
+    assertArrayEquals(frame, screen(300, 60));
+
     Sprite sprite = toolkit.createSprite(4, 4);
     toolkit.drawTo(sprite, null);
     canvas.resize(50, 50);
-    assertEquals(4, toolkit.targetWidth());
+    assertEquals(4, toolkit.targetWidth(), "another target stays");
+    // Through the peer alone the old target is gone, and drawing without a new one harms nobody. Its size stays.
+    toolkit.drawTo(canvas);
+    canvas.wa(component, 10, 10);
+    toolkit.clearAll(-1);
+    if (each == 2) {
+      assertThrows(IllegalStateException.class, () -> canvas.H(0, 0, 10, 10));
+    }
   }
 
   @Test
-  void anUnfitCanvasIsRefused() throws Exception {
-    java.awt.Canvas nowhere = new java.awt.Canvas();
-    assertThrows(IllegalStateException.class, () -> toolkit.createCanvas(nowhere, 10, 10));
-    assertThrows(IllegalArgumentException.class, () -> toolkit.createCanvas(component, 0, 10));
-    assertThrows(NullPointerException.class, () -> toolkit.createCanvas(null, 10, 10));
-    Canvas canvas = toolkit.createCanvas(component, 10, 10);
-    assertThrows(IllegalStateException.class, canvas::present);
-    assertSegments(Boolean.getBoolean("velmark5.test.shm") ? 2 : 0);
-    toolkit.drawTo(canvas);
-    assertThrows(IllegalArgumentException.class, () -> canvas.resize(10, -1));
-    assertThrows(IllegalStateException.class, () -> canvas.resize(nowhere, 10, 10));
-    canvas.present();
+  void segmentsGoWithTheirCanvasAndEvenWithAKilledProcess() throws Exception {
+    assertSegments(each);
+    assertTrue(segments().stream().allMatch("1777"::equals), "marked for removal from the start: " + segments());
     canvas.close();
     canvas.close();
+    assertSegments(0);
+    assertEquals(0, canvas.nativeid);
+    canvas.ma();
     assertThrows(IllegalStateException.class, canvas::present);
     assertThrows(IllegalStateException.class, () -> toolkit.drawTo(canvas));
     toolkit.clearAll(-1);
     assertEquals(0, toolkit.targetWidth());
-    assertSegments(0);
+  }
+
+  @Test
+  void componentsWithoutAWindowAndWrongSizesAreRefused() throws Exception {
+    long before = canvas.nativeid;
+    JPanel lightweight = new JPanel();
+    EventQueue.invokeAndWait(
+        () -> {
+          window.add(lightweight);
+          window.validate();
+        });
+    Component hidden = new java.awt.Canvas();
+    assertThrows(IllegalArgumentException.class, () -> canvas.n(0, lightweight, W, H));
+    assertThrows(IllegalArgumentException.class, () -> canvas.n(0, "text", W, H));
+    assertThrows(NullPointerException.class, () -> canvas.n(0, null, W, H));
+    assertThrows(IllegalArgumentException.class, () -> canvas.wa(component, 60000, 60000));
+    assertThrows(IllegalStateException.class, () -> canvas.wa(hidden, W, H));
+    assertThrows(IllegalStateException.class, () -> toolkit.createCanvas((java.awt.Canvas) hidden, W, H));
+    assertThrows(IllegalArgumentException.class, () -> toolkit.createCanvas(component, 0, H));
+    assertThrows(NullPointerException.class, () -> toolkit.createCanvas(null, W, H));
+    assertThrows(IllegalArgumentException.class, () -> canvas.resize(10, -1));
+    assertEquals(before, canvas.nativeid);
+    assertSegments(each);
+    canvas.present();
+    toolkit.drawToNothing();
+    assertThrows(IllegalStateException.class, canvas::present, "it is not the target");
+  }
+
+  @Test
+  void aWindowThatIsGoneShowsNothingQuietly() throws Exception {
+    EventQueue.invokeAndWait(window::dispose);
+    int[] frame = draw(W, H);
+    canvas.present();
+    canvas.CA(0, 0, 1, 1, 0, 0);
+    assertArrayEquals(frame, backBuffer());
   }
 
   /** The demo, resized and closed as a person would: it ends by itself, and leaves a picture and nothing else. */
   @Test
   void theDemoEndsWithItsWindow() throws Exception {
     toolkit.close();
-    window.dispose();
     Path png = Files.createTempFile("velmark5-demo", ".png");
     try {
-      CompletableFuture<Void> demo = CompletableFuture.runAsync(() -> {
+      var demo = CompletableFuture.supplyAsync(() -> {
         try {
           Demo.main(new String[] {"--size", "320x200", "--png", png.toString()});
+          return true;
         } catch (Exception e) {
           throw new IllegalStateException(e);
         }
@@ -205,22 +244,17 @@ class WindowTest {
       Frame shown = null;
       while (shown == null && !demo.isDone()) {
         Thread.sleep(50);
-        for (Frame frame : Frame.getFrames()) {
-          if (frame.isShowing() && frame != window) {
-            shown = frame;
-          }
-        }
+        shown = Arrays.stream(Frame.getFrames()).filter(f -> f.isShowing() && f != window).findAny().orElse(null);
       }
       Thread.sleep(300);
       shown.setSize(400, 260);
       Thread.sleep(300);
       assertFalse(demo.isDone());
       shown.dispatchEvent(new WindowEvent(shown, WindowEvent.WINDOW_CLOSING));
-      demo.get(20, TimeUnit.SECONDS);
+      assertTrue(demo.get(20, TimeUnit.SECONDS));
       assertFalse(shown.isDisplayable());
-      BufferedImage picture = ImageIO.read(png.toFile());
-      assertTrue(picture.getWidth() > 380, "the picture has the new size: " + picture.getWidth());
-      assertSegments(0);
+      int width = ImageIO.read(png.toFile()).getWidth();
+      assertTrue(width > 380, "the picture has the new size: " + width);
     } finally {
       Files.delete(png);
     }

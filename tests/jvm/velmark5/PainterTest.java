@@ -1,42 +1,28 @@
 package velmark5;
 
-import static org.junit.jupiter.api.Assertions.assertArrayEquals;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertThrows;
+import static org.junit.jupiter.api.Assertions.*;
 
-import java.util.Arrays;
 import java.util.Random;
 import java.util.function.IntBinaryOperator;
 import java.util.function.IntUnaryOperator;
-import org.junit.jupiter.api.AfterEach;
 import org.junit.jupiter.api.BeforeEach;
-import org.junit.jupiter.api.Tag;
 import org.junit.jupiter.api.Test;
 
 /** Each primitive changes just the pixels that it should, seen from Java. */
-@Tag("headless")
-class PainterTest {
+class PainterTest extends ToolkitTest {
   private static final int WIDTH = 37;
   private static final int HEIGHT = 29;
   private static final Rect ALL = new Rect(0, 0, WIDTH, HEIGHT);
   private static final int INK = 0xFF123456;
+  private static final int TINT = 0x5080FF13;
 
-  private Toolkit toolkit;
+  private final int[] start = new Random(5).ints(WIDTH * HEIGHT).toArray();
   private Sprite target;
-  private int[] start;
 
   @BeforeEach
   void openOnNoise() {
-    toolkit = Toolkit.create();
-    target = toolkit.createSprite(WIDTH, HEIGHT);
-    start = new Random(5).ints(WIDTH * HEIGHT).toArray();
+    target = sprite(WIDTH, HEIGHT, start);
     toolkit.drawTo(target, null);
-    toolkit.writeArea(ALL, start, 0, WIDTH);
-  }
-
-  @AfterEach
-  void close() {
-    toolkit.close();
   }
 
   private interface Area {
@@ -52,7 +38,7 @@ class PainterTest {
         expected[i] = pixel.applyAsInt(expected[i]);
       }
     }
-    assertArrayEquals(expected, toolkit.readArea(ALL));
+    assertArrayEquals(expected, pixels());
     toolkit.writeArea(ALL, start, 0, WIDTH);
   }
 
@@ -78,55 +64,46 @@ class PainterTest {
   }
 
   /** The circle of radius 8 around (9, 9). Between an inner and an outer ring the edge's own rule decides. */
-  private Area circle() {
-    return (x, y) -> {
-      int square = (x - 9) * (x - 9) + (y - 9) * (y - 9);
-      boolean isInk = toolkit.readArea(new Rect(x, y, 1, 1))[0] == INK;
-      return square <= 7 * 7 || (square < 9 * 9 && isInk);
-    };
+  private boolean circle(int x, int y) {
+    int square = (x - 9) * (x - 9) + (y - 9) * (y - 9);
+    return square <= 7 * 7 || (square < 9 * 9 && at(x, y) == INK);
   }
 
   @Test
-  void rectanglesInAllModes() {
-    Rect inside = new Rect(3, 4, 21, 9);
-    check(() -> toolkit.fillRect(inside, INK, BlendMode.REPLACE), inside::contains);
-    check(() -> toolkit.fillRect(inside, INK, BlendMode.ALPHA), inside::contains);
-    check(() -> toolkit.fillRect(inside, 0x5080FF13, BlendMode.ALPHA), inside::contains, d -> blended(d, 0x5080FF13));
-    check(() -> toolkit.fillRect(inside, 0x5080FF13, BlendMode.ADD), inside::contains, d -> added(d, 0x5080FF13));
-    Rect over = new Rect(-5, 20, 100, 100);
-    check(() -> toolkit.fillRect(over, INK, BlendMode.REPLACE), over::contains);
+  void shapesInAllModes() {
+    Rect box = new Rect(3, 4, 21, 9);
+    check(() -> toolkit.fillRect(box, INK, BlendMode.REPLACE), box::contains);
+    check(() -> toolkit.fillRect(box, TINT, BlendMode.ALPHA), box::contains, d -> blended(d, TINT));
+    check(() -> toolkit.fillRect(box, TINT, BlendMode.ADD), box::contains, d -> added(d, TINT));
     check(() -> toolkit.clear(INK), ALL::contains);
     Rect hole = new Rect(4, 5, 19, 7);
-    check(() -> toolkit.drawRect(inside, 0x30405060, BlendMode.ADD), (x, y) -> inside.contains(x, y)
-        && !hole.contains(x, y), d -> added(d, 0x30405060));
-  }
-
-  @Test
-  void linesAndCircles() {
+    check(() -> toolkit.drawRect(box, TINT, BlendMode.ADD), (x, y) -> box.contains(x, y) && !hole.contains(x, y),
+        d -> added(d, TINT));
     check(() -> toolkit.horizontalLine(-3, 5, 10, INK, BlendMode.REPLACE), (x, y) -> y == 5 && x < 7);
     check(() -> toolkit.verticalLine(6, 20, 50, INK, BlendMode.REPLACE), (x, y) -> x == 6 && y >= 20);
     check(() -> toolkit.line(25, 20, 5, 0, INK, BlendMode.REPLACE), (x, y) -> x - 5 == y && y <= 20);
-    check(() -> toolkit.line(0, 4, 30, 4, 0x40FFFFFF, BlendMode.ADD), (x, y) -> y == 4 && x <= 30,
-        d -> added(d, 0x40FFFFFF));
-    check(() -> toolkit.fillCircle(9, 9, -8, INK, BlendMode.REPLACE), circle());
+    check(() -> toolkit.fillCircle(9, 9, -8, INK, BlendMode.REPLACE), this::circle);
+    toolkit.drawTo(target, toolkit.createDepthBuffer(WIDTH, HEIGHT));
+    toolkit.clearDepth();
+    check(() -> toolkit.fillCircle(9, 9, 8, INK, BlendMode.REPLACE), this::circle);
   }
 
   @Test
   void masksCutByTheClip() {
-    try (MemoryPool pool = toolkit.createPool(4096);
-        ClippingMask mask =
-            toolkit.createMask(pool, new Spans(9, 3, new int[] {0, 4, 8}, new int[] {9, 2, 0}))) {
-      Area spans = (x, y) -> (y == 10 && x >= 30) || (y == 11 && (x == 34 || x == 35));
-      check(() -> toolkit.fillMask(INK, mask, 30, 10), spans);
-      check(() -> toolkit.withClip(new Rect(0, 11, 35, 10), () -> toolkit.fillMask(INK, mask, 30, 10)),
-          (x, y) -> x == 34 && y == 11);
-      assertEquals(ALL, toolkit.clip());
-      check(() -> toolkit.line(36, 10, 27, 10, INK, BlendMode.REPLACE, mask, 30, 10), (x, y) -> y == 10 && x >= 30);
-      check(() -> toolkit.line(35, 9, 35, 20, INK, BlendMode.REPLACE, mask, 30, 10),
-          (x, y) -> x == 35 && (y == 10 || y == 11));
-      assertEquals(9, mask.width());
-      assertEquals(3, mask.height());
-    }
+    MemoryPool pool = toolkit.createPool(4096);
+    ClippingMask mask = toolkit.createMask(pool, new Spans(9, 3, new int[] {0, 4, 8}, new int[] {9, 2, 0}));
+    Area spans = (x, y) -> (y == 10 && x >= 30) || (y == 11 && (x == 34 || x == 35));
+    check(() -> toolkit.fillMask(INK, mask, 30, 10), spans);
+    check(() -> toolkit.withClip(new Rect(0, 11, 35, 10), () -> toolkit.fillMask(INK, mask, 30, 10)),
+        (x, y) -> x == 34 && y == 11);
+    assertEquals(ALL, toolkit.clip());
+    check(() -> toolkit.line(36, 10, 27, 10, INK, BlendMode.REPLACE, mask, 30, 10), (x, y) -> y == 10 && x >= 30);
+    assertEquals(12, mask.width() + mask.height());
+    Spans circle = Spans.ellipse(8, 8);
+    assertArrayEquals(new int[] {2, 1, 0, 0, 0, 0, 1, 2}, circle.starts());
+    assertArrayEquals(new int[] {4, 6, 8, 8, 8, 8, 6, 4}, circle.lengths());
+    assertArrayEquals(new int[] {0, 0, 0, 0, 0}, Spans.roundedRectangle(10, 5, 1).starts());
+    refuses(IllegalArgumentException.class, () -> new Spans(1, 2, new int[2], new int[1]));
   }
 
   @Test
@@ -135,9 +112,8 @@ class PainterTest {
     assertEquals(Rect.between(0, 5, 20, HEIGHT), toolkit.clip());
     toolkit.narrowClip(new Rect(4, 0, 100, 10));
     Rect clip = Rect.between(4, 5, 20, 10);
-    assertEquals(clip, toolkit.clip());
     check(() -> toolkit.clearAll(INK), clip::contains);
-    assertThrows(ArithmeticException.class, () -> toolkit.withClip(new Rect(9, 9, 0, 0), () -> {
+    refuses(ArithmeticException.class, () -> toolkit.withClip(new Rect(9, 9, 0, 0), () -> {
       toolkit.clear(INK);
       throw new ArithmeticException();
     }));
@@ -146,7 +122,6 @@ class PainterTest {
     toolkit.resetClip();
     assertEquals(ALL, toolkit.clip());
 
-    assertEquals(ALL, toolkit.viewport());
     toolkit.setViewport(new Rect(1, 2, 3, 4));
     toolkit.setDepthRange(0, 1);
     assertEquals(new Rect(1, 2, 3, 4), toolkit.viewport());
@@ -167,37 +142,14 @@ class PainterTest {
     int[] expected = start.clone();
     System.arraycopy(start, 0, expected, 2 * WIDTH + 3, start.length - 2 * WIDTH - 3);
     toolkit.scroll(3, 2);
-    assertArrayEquals(expected, toolkit.readArea(ALL));
     toolkit.scroll(0, -100);
-    assertArrayEquals(expected, toolkit.readArea(ALL));
-
-    var image = toolkit.snapshot();
-    assertEquals(0xFF000000 | expected[5 * WIDTH + 6], image.getRGB(6, 5));
-    for (Rect outside : Arrays.asList(new Rect(-1, 0, 2, 2), new Rect(30, 0, 8, 1), new Rect(0, 28, 1, 2))) {
-      assertThrows(IllegalArgumentException.class, () -> toolkit.readArea(outside));
-      assertThrows(IllegalArgumentException.class, () -> toolkit.writeArea(outside, new int[99], 0, 8));
+    assertEquals(0xFF000000 | expected[5 * WIDTH + 6], toolkit.snapshot().getRGB(6, 5));
+    for (Rect outside : new Rect[] {new Rect(-1, 0, 2, 2), new Rect(30, 0, 8, 1), new Rect(0, 28, 1, 2)}) {
+      refuses(IllegalArgumentException.class, () -> toolkit.readArea(outside),
+          () -> toolkit.writeArea(outside, new int[99], 0, 8));
     }
-    assertThrows(ArrayIndexOutOfBoundsException.class, () -> toolkit.writeArea(part, new int[62], 0, 7));
-    assertThrows(NullPointerException.class, () -> toolkit.writeArea(part, null, 0, 7));
-    assertArrayEquals(expected, toolkit.readArea(ALL));
-  }
-
-  @Test
-  void depthKeepsCirclesOut() {
-    try (DepthBuffer depth = toolkit.createDepthBuffer(WIDTH, HEIGHT)) {
-      toolkit.drawTo(target, depth);
-      toolkit.clearDepth();
-      check(() -> toolkit.fillCircle(9, 9, 8, INK, BlendMode.REPLACE), circle());
-    }
-  }
-
-  @Test
-  void aShapeHasTheRowsOfItsBox() {
-    Spans circle = Spans.ellipse(8, 8);
-    assertArrayEquals(new int[] {2, 1, 0, 0, 0, 0, 1, 2}, circle.starts());
-    assertArrayEquals(new int[] {4, 6, 8, 8, 8, 8, 6, 4}, circle.lengths());
-    Spans box = Spans.roundedRectangle(10, 5, 1);
-    assertArrayEquals(new int[] {0, 0, 0, 0, 0}, box.starts());
-    assertThrows(IllegalArgumentException.class, () -> new Spans(1, 2, new int[2], new int[1]));
+    refuses(ArrayIndexOutOfBoundsException.class, () -> toolkit.writeArea(part, new int[62], 0, 7));
+    refuses(NullPointerException.class, () -> toolkit.writeArea(part, null, 0, 7));
+    assertArrayEquals(expected, pixels());
   }
 }

@@ -1,44 +1,30 @@
 package velmark5;
 
-import static org.junit.jupiter.api.Assertions.assertArrayEquals;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import java.util.Arrays;
 import java.util.List;
 import java.util.function.IntUnaryOperator;
-import org.junit.jupiter.api.AfterEach;
 import org.junit.jupiter.api.BeforeEach;
-import org.junit.jupiter.api.Tag;
 import org.junit.jupiter.api.Test;
 
 /** Sprites and text drawn on a small target, all of whose pixels are compared. */
-@Tag("headless")
-class SpriteAndFontTest {
+class SpriteAndFontTest extends ToolkitTest {
   private static final int WIDTH = 12;
   private static final int HEIGHT = 9;
-  private static final Rect ALL = new Rect(0, 0, WIDTH, HEIGHT);
   private static final int PAPER = 0x00406080;
 
-  private Toolkit toolkit;
   private MemoryPool pool;
   private Sprite target;
 
   @BeforeEach
   void open() {
-    toolkit = Toolkit.create();
     pool = toolkit.createPool(1000);
     target = toolkit.createSprite(WIDTH, HEIGHT);
     toolkit.drawTo(target, null);
   }
 
-  @AfterEach
-  void close() {
-    toolkit.close();
-  }
-
-  /** Draws on paper; the rows say which of the given words each pixel is, with a dot for paper. Missing rows are paper. */
+  /** Draws on paper; the rows say which of the words each pixel is, with a dot for paper. Missing rows are paper. */
   private void assertDraws(Runnable drawing, List<String> rows, int... words) {
     toolkit.clear(PAPER);
     drawing.run();
@@ -50,7 +36,7 @@ class SpriteAndFontTest {
         expected[y * WIDTH + x] = mark == '.' ? PAPER : words[mark - 'a'];
       }
     }
-    assertArrayEquals(expected, toolkit.readArea(ALL));
+    assertArrayEquals(expected, pixels());
   }
 
   /** Puts four channel values together, each given by the channel's shift. */
@@ -62,7 +48,7 @@ class SpriteAndFontTest {
     return result;
   }
 
-  private static int at(int word, int shift) {
+  private static int byteAt(int word, int shift) {
     return word >>> shift & 255;
   }
 
@@ -70,56 +56,53 @@ class SpriteAndFontTest {
   void spritesInTheirPlacements() {
     int a = 0xFF102030;
     int b = 0x80C0D0E0;
-    Sprite sprite = toolkit.createSprite(new int[] {a, b, b, a, a, b}, 3, 2, 3, false);
-    assertDraws(() -> sprite.draw(1, 1, Tint.NONE, BlendMode.REPLACE), List.of("", ".abb", ".aab"), a, b);
-    assertDraws(() -> sprite.draw(-1, 8, Tint.NONE, BlendMode.REPLACE),
-        List.of("", "", "", "", "", "", "", "", "bb"), a, b);
-    assertDraws(() -> toolkit.withClip(new Rect(2, 0, 1, 9), () -> sprite.draw(1, 1, Tint.NONE, BlendMode.REPLACE)),
-        List.of("", "..b", "..a"), a, b);
+    Sprite sprite = sprite(3, 2, a, b, b, a, a, b);
+    Runnable plain = () -> sprite.draw(1, 1, Tint.NONE, BlendMode.REPLACE);
+    assertDraws(plain, List.of("", ".abb", ".aab"), a, b);
+    assertDraws(() -> toolkit.withClip(new Rect(2, 0, 1, 9), plain), List.of("", "..b", "..a"), a, b);
+    sprite.setMargins(new Margins(2, 1, 0, 0));
+    assertDraws(plain, List.of("", "", "...abb", "...aab"), a, b);
+    sprite.setMargins(Margins.NONE);
     assertDraws(() -> sprite.drawScaled(new Rect(1, 0, 6, 4), Tint.NONE, BlendMode.REPLACE),
         List.of(".aabbbb", ".aabbbb", ".aaaabb", ".aaaabb"), a, b);
-    sprite.setMargins(new Margins(2, 1, 0, 0));
-    assertDraws(() -> sprite.draw(1, 1, Tint.NONE, BlendMode.REPLACE), List.of("", "", "...abb", "...aab"), a, b);
-    sprite.setMargins(Margins.NONE);
+    assertDraws(() -> sprite.drawScaled(new Rect(0, 0, 0, 0), Tint.NONE, BlendMode.REPLACE), List.of());
 
-    int over = channels(s -> (at(a, s) * 255 >> 8) + (at(PAPER, s) >> 8));
-    int half = channels(s -> (at(b, s) * 128 >> 8) + (at(PAPER, s) * 128 >> 8));
+    int over = channels(s -> (byteAt(a, s) * 255 >> 8) + (byteAt(PAPER, s) >> 8));
+    int half = channels(s -> (byteAt(b, s) * 128 >> 8) + (byteAt(PAPER, s) * 128 >> 8));
     assertDraws(() -> sprite.draw(0, 0), List.of("abb", "aab"), over, half);
     ClippingMask mask = toolkit.createMask(pool, new Spans(3, 2, new int[] {1, 0}, new int[] {1, 3}));
     assertDraws(() -> sprite.draw(0, 0, mask, 0, 0), List.of(".b", "aab"), over, half);
 
-    DepthBuffer depth = toolkit.createDepthBuffer(WIDTH, HEIGHT);
-    toolkit.drawTo(target, depth);
+    toolkit.drawTo(target, toolkit.createDepthBuffer(WIDTH, HEIGHT));
     toolkit.clearDepth();
     assertDraws(() -> sprite.drawScaled(new Rect(0, 0, 3, 2), 7, Tint.NONE, BlendMode.REPLACE),
         List.of("abb", "aab"), a, b);
-    toolkit.drawTo(target, null);
-    assertDraws(() -> sprite.drawScaled(new Rect(0, 0, 0, 0), Tint.NONE, BlendMode.REPLACE), List.of());
     sprite.close();
-    assertThrows(IllegalStateException.class, () -> sprite.draw(0, 0));
+    refuses(IllegalStateException.class, () -> sprite.draw(0, 0));
   }
 
   @Test
   void tintsAndBlends() {
     int s = 0x70C01008;
     int c = 0x50A0F010;
-    Sprite sprite = toolkit.createSprite(new int[] {s}, 1, 1, 1, false);
-    int[][] cases = {
-      {0, channels(i -> at(s, i) * at(c, i) >> 8)},
-      {1, channels(i -> (at(s, i) * 100 >> 8) + (at(c, i) * 155 >> 8))},
-      {2, channels(i -> Math.min(255, at(s, i) + at(c, i)))},
-      {3, channels(i -> Math.max(0, at(s, i) - at(c, i)))},
-    };
+    Sprite sprite = sprite(1, 1, s);
+    int mixed = channels(i -> (byteAt(s, i) * 100 >> 8) + (byteAt(c, i) * 155 >> 8));
     Tint[] tints = {Tint.multiply(c), Tint.mix(c, 100), Tint.add(c), Tint.subtract(c)};
-    // A mixture's alpha is mixed with the number that says how much is kept.
-    cases[1][1] = Colour.withAlpha(cases[1][1], (at(s, 24) * 100 >> 8) + (100 * 155 >> 8));
-    for (int[] each : cases) {
-      int word = each[1];
-      assertDraws(() -> sprite.draw(0, 0, tints[each[0]], BlendMode.REPLACE), List.of("a"), word);
-      assertDraws(() -> sprite.draw(0, 0, tints[each[0]], BlendMode.ADD), List.of("a"),
-          channels(i -> Math.min(255, at(word, i) + at(PAPER, i))));
+    int[] words = {
+      channels(i -> byteAt(s, i) * byteAt(c, i) >> 8),
+      // A mixture's alpha is mixed with the number that says how much is kept.
+      Colour.withAlpha(mixed, (byteAt(s, 24) * 100 >> 8) + (100 * 155 >> 8)),
+      channels(i -> Math.min(255, byteAt(s, i) + byteAt(c, i))),
+      channels(i -> Math.max(0, byteAt(s, i) - byteAt(c, i))),
+    };
+    for (int n = 0; n < 4; n++) {
+      Tint tint = tints[n];
+      int word = words[n];
+      assertDraws(() -> sprite.draw(0, 0, tint, BlendMode.REPLACE), List.of("a"), word);
+      assertDraws(() -> sprite.draw(0, 0, tint, BlendMode.ADD), List.of("a"),
+          channels(i -> Math.min(255, byteAt(word, i) + byteAt(PAPER, i))));
     }
-    assertThrows(IllegalArgumentException.class, () -> Tint.mix(c, 128));
+    refuses(IllegalArgumentException.class, () -> Tint.mix(c, 128));
   }
 
   /** An "L" and a dot, on and off, two columns from pen to pen. */
@@ -134,63 +117,49 @@ class SpriteAndFontTest {
         4);
   }
 
+  /** Ink on paper, each in its share of 256ths; fonts leave no alpha. */
+  private static int mixed(int ink, int inkShare, int paperShare) {
+    return channels(i -> i == 24 ? 0 : (byteAt(PAPER, i) * paperShare >> 8) + (byteAt(ink, i) * inkShare >> 8));
+  }
+
   @Test
   void textInThreeKindsOfFont() {
     int ink = 0xFF123456;
-    List<String> text = List.of("", ".a", ".a", ".aa..a", "", ".a", ".a", ".aa");
     Font mono = toolkit.createMonoFont(pool, letters(1));
-    assertDraws(() -> mono.draw("Lx\nL", 1, 4, ink), text, ink);
-    assertDraws(() -> mono.draw("L", 1, 4, 0x00123456), List.of());
-    int half = channels(i -> i == 24 ? 0 : (at(PAPER, i) * 127 + at(ink, i) * 128) >> 8);
-    toolkit.clear(PAPER);
-    mono.draw("?", 0, 1, 0x80123456);
-    int seen = toolkit.readArea(ALL)[1];
-    for (int shift = 0; shift < 24; shift += 8) {
-      assertEquals(at(half, shift), at(seen, shift), 1, "the two products are truncated together or apart");
-    }
-
     Font smooth = toolkit.createSmoothFont(pool, letters(64));
-    toolkit.clear(PAPER);
-    smooth.draw("Lx\nL", 1, 4, ink);
-    int covered = toolkit.readArea(ALL)[WIDTH + 1];
-    for (int shift = 0; shift < 24; shift += 8) {
-      assertEquals((at(PAPER, shift) * 192 + at(ink, shift) * 64) >> 8, at(covered, shift), 1);
-    }
-    assertDraws(() -> smooth.draw("Lx\nL", 1, 4, ink), text, covered);
-
     PalettedFont paletted = toolkit.createPalettedFont(pool, letters(2), new int[] {9, 9, 0x777777});
-    assertDraws(() -> paletted.draw("Lx\nL", 1, 4), text, 0x777777);
-    assertDraws(() -> paletted.draw("Lx\nL", 1, 4, ink), text, ink);
-    assertThrows(IllegalArgumentException.class, () -> toolkit.createPalettedFont(pool, letters(2), new int[2]));
-
+    int covered = mixed(ink, 64, 192);
     // Up the screen: the foot of the L points up, the dot stands one pixel from its pen.
+    List<String> text = List.of("", ".a", ".a", ".aa..a", "", ".a", ".a", ".aa");
     List<String> upwards = List.of("", "....a", "", "", "....a", "..aaa");
-    assertDraws(() -> mono.drawUpwards("L?", 5, 6, ink), upwards, ink);
-    assertDraws(() -> smooth.drawUpwards("L?", 5, 6, ink), upwards, covered);
-    assertDraws(() -> paletted.drawUpwards("L?", 5, 6), upwards, 0x777777);
-    assertDraws(() -> paletted.drawUpwards("L?", 5, 6, ink), upwards, ink);
-
-    ClippingMask mask = toolkit.createMask(pool, new Spans(9, 2, new int[] {0, 2}, new int[] {9, 1}));
     List<String> masked = List.of("", "", ".a", "..a");
-    assertDraws(() -> mono.draw("L?", 1, 4, ink, mask, 0, 2), masked, ink);
-    assertDraws(() -> smooth.draw("L?", 1, 4, ink, mask, 0, 2), masked, covered);
+    ClippingMask mask = toolkit.createMask(pool, new Spans(9, 2, new int[] {0, 2}, new int[] {9, 1}));
+    for (Font font : List.of(mono, smooth, paletted)) {
+      int seen = font == smooth ? covered : ink;
+      assertDraws(() -> font.draw("Lx\nL", 1, 4, ink), text, seen);
+      assertDraws(() -> font.drawUpwards("L?", 5, 6, ink), upwards, seen);
+      assertDraws(() -> font.draw("L?", 1, 4, ink, mask, 0, 2), masked, seen);
+    }
+    assertDraws(() -> paletted.draw("Lx\nL", 1, 4), text, 0x777777);
+    assertDraws(() -> paletted.drawUpwards("L?", 5, 6), upwards, 0x777777);
     assertDraws(() -> paletted.draw("L?", 1, 4, mask, 0, 2), masked, 0x777777);
-    assertDraws(() -> paletted.draw("L?", 1, 4, ink, mask, 0, 2), masked, ink);
-    assertThrows(NullPointerException.class, () -> mono.draw("L", 0, 0, ink, null, 0, 0));
 
+    assertDraws(() -> mono.draw("?", 0, 1, 0x80123456), List.of(".a"), mixed(ink, 128, 127));
+    assertDraws(() -> mono.draw("L", 1, 4, 0x00123456), List.of());
     assertEquals(8, mono.width("L L\nx"));
+    refuses(IllegalArgumentException.class, () -> toolkit.createPalettedFont(pool, letters(2), new int[2]));
+    refuses(NullPointerException.class, () -> mono.draw("L", 0, 0, ink, null, 0, 0));
     pool.close();
     assertDraws(() -> mono.draw("L", 1, 4, ink), List.of());
     mono.close();
-    assertThrows(IllegalStateException.class, () -> mono.draw("L", 1, 4, ink));
+    refuses(IllegalStateException.class, () -> mono.draw("L", 1, 4, ink));
   }
 
   @Test
   void fontsOfTheMachine() {
     var typeface = new java.awt.Font(java.awt.Font.SANS_SERIF, java.awt.Font.BOLD, 30);
-    for (Glyphs glyphs :
-        List.of(
-            Glyphs.smooth(typeface, "LI"), Glyphs.hard(typeface, "LI"), Glyphs.outlined(typeface, "LI", 5))) {
+    for (Glyphs glyphs : List.of(
+        Glyphs.smooth(typeface, "LI"), Glyphs.hard(typeface, "LI"), Glyphs.outlined(typeface, "LI", 5))) {
       Glyphs.Glyph letter = glyphs.list().get(glyphs.indexOf('L'));
       assertTrue(letter.height() > 15 && letter.height() < 32, "a capital of " + letter.height() + " rows");
       assertEquals(0, letter.yOffset() + letter.height(), 2, "it stands on the baseline");
@@ -205,8 +174,7 @@ class SpriteAndFontTest {
       assertTrue(low * 2 > lit * 4 / 5, "the foot of an L is its heavier half");
       assertTrue(glyphs.width("LL") > glyphs.width("II"));
     }
-    assertThrows(IllegalArgumentException.class, () -> Glyphs.outlined(typeface, "L", 254));
-    assertThrows(
-        IllegalArgumentException.class, () -> new Glyphs.Glyph('x', 2, 2, new byte[3], 0, 0, 1));
+    refuses(IllegalArgumentException.class, () -> Glyphs.outlined(typeface, "L", 254),
+        () -> new Glyphs.Glyph('x', 2, 2, new byte[3], 0, 0, 1));
   }
 }
