@@ -77,10 +77,15 @@ final class Carpentry {
     return s.build();
   }
 
+  /** How wide a house's walls are. */
+  static double width(int seed) {
+    return 370 + 70 * Noise.hash(seed + 31);
+  }
+
   /** A house whose door looks towards an angle; its windows are models of their own, for day and night. */
   static Mesh hut(int seed, double angle, boolean windowsOnly, boolean lit) {
     Sculptor s = new Sculptor().at(0, 0, 0, angle);
-    double w = 400 + 120 * Noise.hash(seed + 31);
+    double w = width(seed);
     double d = 320;
     double wall = 240;
     if (windowsOnly) {
@@ -104,6 +109,9 @@ final class Carpentry {
     double ridge = 432;
     s.gable(new double[] {l, ridge - 12, 0, l, wall, f, l, wall, n}, PLASTER);
     s.gable(new double[] {r, ridge - 12, 0, r, wall, n, r, wall, f}, PLASTER);
+    for (double x : new double[] {l, r}) {
+      s.box(x, wall - 8, 0, 10, 16, d, WOOD, 120);
+    }
     int[] reds = {0xB5532F, 0xA6482E, 0x8F5A38, 0xC06A3A};
     Material tiles = plain(reds[seed & 3], Textures.SHINGLES);
     double a = l - 50;
@@ -164,21 +172,31 @@ final class Carpentry {
     return s.build();
   }
 
+  /** An arched bridge along x. */
   static Mesh bridge(double length) {
     Sculptor s = new Sculptor();
-    int planks = 14;
+    int planks = 18;
     for (int i = 0; i < planks; i++) {
-      double t = (i + 0.5) / planks;
-      double up = 62 * Math.sin(Math.PI * t);
-      s.box((t - 0.5) * length, up - 14, 0, length / planks - 3, 16, 150, BOARDS, 90);
-      for (int side = -1; side <= 1; side += 2) {
-        if (i % 3 == 0 || i == planks - 1) {
-          s.box((t - 0.5) * length, up - 60, 70 * side, 14, 140, 14, BOARDS, 80);
+      double x = ((i + 0.5) / planks - 0.5) * length;
+      s.box(x, arch(x, length) - 14, 0, length / planks - 3, 16, 150, BOARDS, 90);
+    }
+    int fields = 6;
+    for (int side = -1; side <= 1; side += 2) {
+      for (int i = 0; i <= fields; i++) {
+        double x = (i / (double) fields - 0.5) * (length - 14);
+        s.box(x, arch(x, length) - 60, 70 * side, 14, 140, 14, BOARDS, 80);
+        double next = x + (length - 14) / fields;
+        for (double up : i < fields ? new double[] {30, 68} : new double[0]) {
+          s.beam(x, arch(x, length) + up, next, arch(next, length) + up, 70 * side, 10, 8, BOARDS);
         }
-        s.box((t - 0.5) * length, up + 62, 70 * side, length / planks + 1, 10, 8, BOARDS, 80);
       }
     }
     return s.build();
+  }
+
+  /** How high a bridge rises at a place between its ends. */
+  static double arch(double x, double length) {
+    return 62 * Math.cos(Math.PI * x / length);
   }
 
   static Mesh lampPost() {

@@ -171,10 +171,10 @@ public final class Demo {
       return List.of(
           new Sky(toolkit),
           new Hills(toolkit),
+          new Lanterns(toolkit),
           new Stones(toolkit, pool, knot, false),
           knot,
           new Stones(toolkit, pool, knot, true),
-          new Lanterns(toolkit),
           new Lake(toolkit),
           spectrum,
           radar,

@@ -20,6 +20,7 @@ final class Firmament implements Scene {
   private final Pilot pilot;
   private final Daylight day;
   private final Sprite[] shapes = new Sprite[3];
+  private final Sprite halo;
   private int width;
   private int height;
   private double focus;
@@ -33,6 +34,19 @@ final class Firmament implements Scene {
     for (int i = 0; i < shapes.length; i++) {
       shapes[i] = cloud(i);
     }
+    halo = halo();
+  }
+
+  /** Light that fades from a middle, for the sun and the moon. */
+  private Sprite halo() {
+    int side = 256;
+    int[] pixels = new int[side * side];
+    for (int i = 0; i < pixels.length; i++) {
+      double far = Math.hypot(i % side - (side - 1) / 2.0, i / side - (side - 1) / 2.0) / (side / 2.0);
+      int v = (int) (255 * Math.pow(Math.max(0, 1 - far), 2.2));
+      pixels[i] = Colour.rgb(v, v, v);
+    }
+    return toolkit.createSprite(pixels, side, side, side, true);
   }
 
   private Sprite cloud(int seed) {
@@ -142,10 +156,13 @@ final class Firmament implements Scene {
       return;
     }
     int radius = height / 26;
-    for (int i = 14; i > 0; i--) {
-      toolkit.fillCircle((int) point.x(), (int) point.y(), radius + radius * i * i / 14, Colour.scale(day.light(), 0.022), BlendMode.ADD);
-    }
+    shine(point, 15 * radius, Colour.scale(day.light(), 0.30));
     toolkit.fillCircle((int) point.x(), (int) point.y(), radius, Colour.mix(day.light(), Colour.WHITE, 0.5), BlendMode.REPLACE);
+  }
+
+  private void shine(Matrix.ScreenPoint point, int reach, int light) {
+    Rect area = new Rect((int) point.x() - reach, (int) point.y() - reach, 2 * reach, 2 * reach);
+    halo.drawScaled(area, Tint.multiply(light), BlendMode.ADD);
   }
 
   private void paintMoon() {
@@ -155,9 +172,7 @@ final class Firmament implements Scene {
       return;
     }
     int radius = height / 34;
-    for (int i = 8; i > 0; i--) {
-      toolkit.fillCircle((int) point.x(), (int) point.y(), radius + radius * i / 3, 0xFF05070C, BlendMode.ADD);
-    }
+    shine(point, 6 * radius, 0xFF38404C);
     toolkit.fillCircle((int) point.x(), (int) point.y(), radius, 0xFFE8ECF4, BlendMode.REPLACE);
     toolkit.fillCircle((int) point.x() - radius / 3, (int) point.y() - radius / 4, radius / 4, 0xFFCDD3E0, BlendMode.REPLACE);
     toolkit.fillCircle((int) point.x() + radius / 3, (int) point.y() + radius / 3, radius / 3, 0xFFD4DAE6, BlendMode.REPLACE);

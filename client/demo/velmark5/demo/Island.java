@@ -15,6 +15,12 @@ final class Island {
   static final double FALL_Z = 1130;
   static final double BRIDGE_Z = -290;
 
+  /** Half the width of the river's flat bed. */
+  static final double RIVER_BED = 46;
+
+  /** How far from the river's middle its water meets the bank. */
+  static final double RIVER_EDGE = 122;
+
   private static final double[][] COURSE = {
     {530, 1330, 88}, {FALL_X, FALL_Z, 86}, {430, 720, 78}, {600, 250, 66}, {480, -280, 54}, {640, -800, 36},
     {560, -1400, 14}, {760, -2000, 0}, {820, -2700, -6}, {860, -3300, -10}
@@ -23,7 +29,7 @@ final class Island {
   /** The river from the pool to the sea: x, z and level of its surface. */
   static final List<double[]> RIVER = course();
 
-  private static final double[][][] PATHS = {
+  static final double[][][] PATHS = {
     {{-350, -250}, {60, -250}, {480, BRIDGE_Z}, {900, -300}, {MOUND_X, MOUND_Z}},
     {{-350, -250}, {-420, -800}, {-250, -1400}, {-330, -2300}},
     {{-350, -250}, {-800, -120}, {-1200, 200}, {-1560, 260}}
@@ -67,32 +73,64 @@ final class Island {
     return coast - bay - Math.hypot(x, z);
   }
 
-  static double riverDistance(double x, double z) {
-    double[] nearest = nearest(x, z);
-    return Math.hypot(nearest[0] - x, nearest[1] - z);
+  /** How far from the island's middle, in the direction of an angle, the sea is so far out from the shore. */
+  static double shore(double angle, double out) {
+    double low = 0;
+    double high = 4000 + Math.max(0, out);
+    for (int i = 0; i < 24; i++) {
+      double far = (low + high) / 2;
+      if (inland(far * Math.cos(angle), far * Math.sin(angle)) > -out) {
+        low = far;
+      } else {
+        high = far;
+      }
+    }
+    return low;
   }
 
+  static double riverDistance(double x, double z) {
+    return nearest(x, z)[0];
+  }
+
+  /** How far the middle of the river is from a place, and the river's level there. */
   private static double[] nearest(double x, double z) {
-    double[] best = RIVER.get(0);
+    int at = 0;
     double least = Double.MAX_VALUE;
-    for (double[] p : RIVER) {
+    for (int i = 0; i < RIVER.size(); i++) {
+      double[] p = RIVER.get(i);
       double d = (p[0] - x) * (p[0] - x) + (p[1] - z) * (p[1] - z);
       if (d < least) {
         least = d;
-        best = p;
+        at = i;
+      }
+    }
+    double[] best = {Double.MAX_VALUE, 0};
+    for (int i = Math.max(0, at - 1); i <= Math.min(at, RIVER.size() - 2); i++) {
+      double[] a = RIVER.get(i);
+      double[] b = RIVER.get(i + 1);
+      double t = along(a, b, x, z);
+      double far = Math.hypot(mix(a[0], b[0], t) - x, mix(a[1], b[1], t) - z);
+      if (far < best[0]) {
+        best = new double[] {far, mix(a[2], b[2], t)};
       }
     }
     return best;
+  }
+
+  /** Which part of the way from a to b lies behind the foot point of a place, 0 to 1. */
+  private static double along(double[] a, double[] b, double x, double z) {
+    double dx = b[0] - a[0];
+    double dz = b[1] - a[1];
+    return Math.max(0, Math.min(1, ((x - a[0]) * dx + (z - a[1]) * dz) / (dx * dx + dz * dz)));
   }
 
   static double pathDistance(double x, double z) {
     double least = Double.MAX_VALUE;
     for (double[][] path : PATHS) {
       for (int i = 0; i + 1 < path.length; i++) {
-        double dx = path[i + 1][0] - path[i][0];
-        double dz = path[i + 1][1] - path[i][1];
-        double t = Math.max(0, Math.min(1, ((x - path[i][0]) * dx + (z - path[i][1]) * dz) / (dx * dx + dz * dz)));
-        least = Math.min(least, Math.hypot(path[i][0] + t * dx - x, path[i][1] + t * dz - z));
+        double t = along(path[i], path[i + 1], x, z);
+        least = Math.min(
+            least, Math.hypot(mix(path[i][0], path[i + 1][0], t) - x, mix(path[i][1], path[i + 1][1], t) - z));
       }
     }
     return least;
@@ -130,10 +168,19 @@ final class Island {
     double folds = 0.62 + 0.62 * Noise.creased(33, x / 620 + 20, z / 620 + 20, 3);
     h += Math.pow(peak, 1.25) * 1350 * folds * step(0, 300, shore);
 
+    // A crown of rocks around the place where the fall springs up, open to the south.
+    double round = Math.hypot(x - FALL_X, z - 1560);
+    h += 230 * Math.exp(-Math.pow((round - 190) / 85, 2)) * step(1340, 1450, z);
+
+    if (Math.abs(x - 600) > 900) {
+      return h; // far from the river
+    }
     double[] river = nearest(x, z);
-    double d = Math.hypot(river[0] - x, river[1] - z);
-    double bank = river[2] - 42 + Math.max(0, d - 46) * 0.55 + Math.max(0, d - 165) * 3.8;
-    return Math.min(h, bank);
+    double d = river[0];
+    // Gentle banks, but for the gorge that the fall has cut.
+    double gorge = step(850, 1050, z);
+    double bank = mix(0.006 * Math.pow(Math.max(0, d - 150), 2), 3.8 * Math.max(0, d - 165), gorge);
+    return Math.min(h, river[1] - 42 + Math.max(0, d - RIVER_BED) * 0.55 + bank);
   }
 
   /** How steep the ground is: 0 level, 1 at 45 degrees. */

@@ -94,7 +94,7 @@ final class Overlay implements Scene {
       shadowed("drag: look   W A S D: move   Q E: down, up   Shift: faster   F: fly", margin + 2, line, PALE);
       line -= step;
     }
-    shadowed(rate + "   " + models + " models   " + day.clock(), margin + 2, line, GOLD);
+    shadowed((rate + "   " + models + " models   " + day.clock()).strip(), margin + 2, line, GOLD);
     line -= step;
     shadowed(width + " × " + height + ", drawn by the processor alone", margin + 2, line, PALE);
     title.draw("velmark5", margin, line - step - body.lineHeight() / 4);

@@ -1,6 +1,7 @@
 package velmark5.demo;
 
 import java.util.ArrayList;
+import java.util.Arrays;
 import java.util.List;
 import velmark5.Material;
 import velmark5.Mesh;
@@ -70,9 +71,27 @@ final class Sculptor {
     }
   }
 
-  /** The plane that lays one repeat of a texture over each so many units of the ground, from the foot point. */
-  TextureMapping groundPlane(double size) {
-    return new TextureMapping.Plane(corner(0, 0, 0), corner(size, 0, 0), corner(0, 0, -size));
+  /**
+   * The plane that lays one repeat of a texture over each so many units of the ground. Planes of one size fit each other,
+   * whatever the place they are made for.
+   */
+  TextureMapping groundPlane(double size, double[] near) {
+    return plane(size, near, new double[] {1, 0, 0}, new double[] {0, 0, -1});
+  }
+
+  /** The same for walls that look along z, or along x, the texture drawn out in height. */
+  TextureMapping wallPlane(double size, double[] near, boolean alongZ) {
+    return plane(size, near, alongZ ? new double[] {1, 0, 0} : new double[] {0, 0, 1}, new double[] {0, -3, 0});
+  }
+
+  private TextureMapping plane(double size, double[] near, double[] right, double[] down) {
+    double whole = 3 * size;
+    double[] origin = Arrays.stream(near).map(place -> Math.rint(place / whole) * whole).toArray();
+    for (int i = 0; i < 3; i++) {
+      right[i] = origin[i] + size * right[i];
+      down[i] = origin[i] + size * down[i];
+    }
+    return new TextureMapping.Plane(corner(origin), corner(right), corner(down));
   }
 
   /**
@@ -125,7 +144,11 @@ final class Sculptor {
   }
 
   static double[] between(double[] a, double[] b, double t) {
-    return new double[] {a[0] + (b[0] - a[0]) * t, a[1] + (b[1] - a[1]) * t, a[2] + (b[2] - a[2]) * t};
+    double[] result = new double[a.length];
+    for (int i = 0; i < result.length; i++) {
+      result[i] = a[i] + (b[i] - a[i]) * t;
+    }
+    return result;
   }
 
   /** A triangle of its own, with one repeat of a texture over its box; corners as for a panel, the tip first. */
@@ -152,6 +175,18 @@ final class Sculptor {
     panel(new double[] {l, t, f, l, up, f, l, up, n, l, t, n}, material, deep / repeat, tallRepeats);
     panel(new double[] {r, t, n, r, up, n, r, up, f, r, t, f}, material, deep / repeat, tallRepeats);
     panel(new double[] {l, t, f, l, t, n, r, t, n, r, t, f}, material, wide / repeat, deep / repeat);
+  }
+
+  /** A bar between two points of the plane at z, its middle line at their heights. */
+  void beam(double x0, double up0, double x1, double up1, double z, double tall, double deep, Material material) {
+    double h = tall / 2;
+    double n = z - deep / 2;
+    double f = z + deep / 2;
+    double down = tall / Math.hypot(x1 - x0, up1 - up0);
+    panel(new double[] {x0, up0 + h, n, x0, up0 - h, n, x1, up1 - h, n, x1, up1 + h, n}, material, 1, down);
+    panel(new double[] {x1, up1 + h, f, x1, up1 - h, f, x0, up0 - h, f, x0, up0 + h, f}, material, 1, down);
+    panel(new double[] {x0, up0 + h, f, x0, up0 + h, n, x1, up1 + h, n, x1, up1 + h, f}, material, 1, down);
+    panel(new double[] {x0, up0 - h, n, x0, up0 - h, f, x1, up1 - h, f, x1, up1 - h, n}, material, 1, down);
   }
 
   /** What a profile, pairs of radius and height from the bottom up, sweeps around the foot's axis. */
@@ -197,7 +232,7 @@ final class Sculptor {
 
   /** A bumpy ball around a height above the foot. */
   void ball(double up, double radius, double squash, double bumps, int seed, Material material) {
-    int rings = 7;
+    int rings = 6;
     double[] profile = new double[2 * rings];
     for (int i = 0; i < rings; i++) {
       double angle = Math.PI * i / (rings - 1) - Math.PI / 2;

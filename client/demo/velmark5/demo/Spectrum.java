@@ -24,6 +24,9 @@ final class Spectrum implements Scene {
   private Rect plot = panel;
   private Rect past = panel;
 
+  /** Rows at the top of the plot that are left to its labels. */
+  private int labelled;
+
   Spectrum(Toolkit toolkit) {
     this.toolkit = toolkit;
     // A fine diagonal pattern that the panel is tiled with.
@@ -60,6 +63,7 @@ final class Spectrum implements Scene {
     plot = new Rect(panel.x() + indent, panel.y() + 2 * unit, inner, plotTall);
     past = Rect.between(plot.x(), plot.bottom() + 2 * unit, plot.right(), panel.bottom() - 2 * unit)
         .intersect(new Rect(0, 0, width, height));
+    labelled = Math.max(4, Math.min(plotTall / 3, height / 36));
     levels = new double[inner];
     if (waterfall != null) {
       waterfall.close();
@@ -133,7 +137,7 @@ final class Spectrum implements Scene {
     int before = 0;
     for (int i = 0; i < levels.length; i++) {
       int x = plot.x() + i;
-      int y = plot.bottom() - 1 - (int) (levels[i] * (plot.height() - 4));
+      int y = plot.bottom() - 1 - (int) (levels[i] * (plot.height() - labelled));
       int tint = Colour.mix(0xFF2FA8FF, 0xFFFF6AA0, levels[i] * 1.1);
       toolkit.verticalLine(x, y, plot.bottom() - y, Colour.withAlpha(tint, 70), BlendMode.ALPHA);
       if (i > 0) {

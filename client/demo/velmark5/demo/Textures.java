@@ -61,8 +61,14 @@ final class Textures implements TextureSource {
   /** Puffs of smoke or spray: the first of three, each thinner than the one before. */
   static final int PUFF = 17;
 
+  /** Trodden or washed ground along a line: whole in the middle, frayed at the left and the right edge. */
+  static final int TRACK = 20;
+
+  /** Trodden ground around a place, frayed at its rim. */
+  static final int YARD = 21;
+
   /** How many there are. */
-  static final int COUNT = 20;
+  static final int COUNT = 22;
 
   private static final int UNLIT = 6;
 
@@ -76,7 +82,8 @@ final class Textures implements TextureSource {
       case FALL -> metrics.withScroll(0, -72).withAlpha(TextureMetrics.Alpha.BLENDED);
       case VEIL -> metrics.withScroll(6, 14).withAlpha(TextureMetrics.Alpha.BLENDED).withLighting(UNLIT);
       case GLOW -> metrics.withAlpha(TextureMetrics.Alpha.BLENDED).withLighting(UNLIT).withWrap(false, false);
-      case PUFF, PUFF + 1, PUFF + 2 -> metrics.withAlpha(TextureMetrics.Alpha.BLENDED).withWrap(false, false);
+      case PUFF, PUFF + 1, PUFF + 2, YARD -> metrics.withAlpha(TextureMetrics.Alpha.BLENDED).withWrap(false, false);
+      case TRACK -> metrics.withAlpha(TextureMetrics.Alpha.BLENDED);
       case FLAMES -> metrics.withScroll(0, 100).withAlpha(TextureMetrics.Alpha.BLENDED).withLighting(UNLIT);
       default -> metrics;
     };
@@ -108,6 +115,8 @@ final class Textures implements TextureSource {
       case DARK_WINDOW, LIT_WINDOW -> window(x, y, id == LIT_WINDOW);
       case FLAMES -> flames(x, y);
       case PUFF, PUFF + 1, PUFF + 2 -> puff(x, y, 0.62 - 0.22 * (id - PUFF));
+      case TRACK -> frayed(1 - Math.abs(x - 63.5) / 63.5, x, y);
+      case YARD -> frayed(1 - Math.hypot(x - 63.5, y - 63.5) / 63.5, x, y);
       default -> rock(x, y);
     };
   }
@@ -193,6 +202,14 @@ final class Textures implements TextureSource {
     double far = Math.hypot(x - 63.5, y - 63.5) / 63;
     double light = Math.pow(Math.max(0, 1 - far), 1.6);
     return Colour.argb((int) (150 * light), 255, 255, 255);
+  }
+
+  /** Grains of earth, for 0 at the edge of what they cover to 1 in its middle. */
+  private static int frayed(double inside, int x, int y) {
+    double rough = repeating(73, x, y, 0.08);
+    double whole = Island.step(0, 1, inside * 2.6 + 1.6 * (rough - 0.55));
+    int earth = grey(0.74 + 0.34 * (repeating(5, x, y, 0.11) - 0.4) + 0.12 * (speck(TRACK, x, y) - 0.5));
+    return Colour.withAlpha(earth, (int) (255 * whole * Math.min(1, inside * 6)));
   }
 
   private static int puff(int x, int y, double dense) {

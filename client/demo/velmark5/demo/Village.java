@@ -3,6 +3,7 @@ package velmark5.demo;
 import java.util.ArrayList;
 import java.util.Comparator;
 import java.util.List;
+import java.util.stream.IntStream;
 import velmark5.Colour;
 import velmark5.Matrix;
 import velmark5.MemoryPool;
@@ -20,6 +21,11 @@ final class Village implements Scene {
   private static final double NEAR = 40;
   private static final double FAR = 9500;
   private static final int FOG_BEGINS = 2900;
+
+  /** Shadows farther away are too small to be missed. */
+  private static final double SHADOWS_END = 3000;
+
+  private static final double BRIDGE = 440;
   private static final int FLAME = 0xFF9A3C;
   private static final int WARM = 0xFFC070;
   private static final int UNEARTHLY = 0x50C8FF;
@@ -34,14 +40,15 @@ final class Village implements Scene {
   private final List<Prop> props = new ArrayList<>();
   private final List<Prop> windows = new ArrayList<>();
   private final List<Prop> litWindows = new ArrayList<>();
-  private final List<Model> glows = new ArrayList<>();
+  private final List<Prop> flat = new ArrayList<>();
+  private final List<Prop> shadows = new ArrayList<>();
+  private final List<Prop> glows = new ArrayList<>();
   private final List<double[]> chimneys = new ArrayList<>();
-  private final Sculptor shadows = new Sculptor();
-  private final Prop land;
-  private final Model sea;
-  private final Model river;
+  private final List<LitPatch> land = new ArrayList<>();
+  private final List<Patch> sea = new ArrayList<>();
+  private final List<Patch> river = new ArrayList<>();
   private final Model fall;
-  private final Model shadow;
+  private final Decals decals;
   private final Model sails;
   private final Model boat;
   private final Model flames;
@@ -59,7 +66,9 @@ final class Village implements Scene {
   private record Lamp(double x, double up, double z, int range, int colour, double flicker) {}
 
   /** What stands still, and the numbers of the lamps that are nearest to it. */
-  private record Prop(Model model, Matrix place, int[] lamps) {}
+  private record Prop(Model model, Matrix place, double x, double z, int[] lamps) {}
+
+  private record LitPatch(Patch patch, int[] lamps) {}
 
   private record Puff(Model model, double size, double x, double up, double z) {}
 
@@ -69,10 +78,11 @@ final class Village implements Scene {
     this.pilot = pilot;
     this.day = day;
     resource = toolkit.createThreadResource();
-    land = new Prop(model(Grounds.land()), Matrix.IDENTITY, new int[] {0, 1, 2, 3});
-    sea = model(Grounds.sea());
-    river = model(Grounds.river());
-    fall = model(Grounds.fall());
+    Terrain terrain = new Terrain();
+    decals = new Decals(terrain);
+    Waters.sea().forEach(shape -> sea.add(new Patch(this::model, shape)));
+    Waters.river().forEach(shape -> river.add(new Patch(this::model, shape)));
+    fall = model(Waters.fall());
     sails = model(Carpentry.sails());
     boat = model(Carpentry.boat());
     flames = model(Carpentry.flames());
@@ -91,7 +101,15 @@ final class Village implements Scene {
     placeGate();
     placeWaterside();
     placeTrees();
-    shadow = model(shadows.build());
+    for (Patch.Shape shape : terrain.patches()) {
+      Patch patch = new Patch(this::model, shape);
+      land.add(new LitPatch(patch, nearestLamps(patch.middleX(), patch.middleZ())));
+    }
+    decals.riverBed().forEach(decal -> lay(flat, decal));
+    lay(flat, decals.square(Island.VILLAGE_X, Island.VILLAGE_Z, 330));
+    for (double[][] path : Island.PATHS) {
+      decals.path(path).forEach(decal -> lay(flat, decal));
+    }
   }
 
   private Model model(Mesh mesh) {
@@ -103,14 +121,21 @@ final class Village implements Scene {
   }
 
   private void put(List<Prop> list, Model model, double x, double up, double z, double scale) {
-    int[] nearest =
-        java.util.stream.IntStream.range(0, lamps.size())
-            .boxed()
-            .sorted(Comparator.comparingDouble(i -> Math.hypot(lamps.get(i).x - x, lamps.get(i).z - z)))
-            .limit(4)
-            .mapToInt(i -> i)
-            .toArray();
-    list.add(new Prop(model, Matrix.scaling(scale, scale, scale).then(standing(x, up, z)), nearest));
+    Matrix place = Matrix.scaling(scale, scale, scale).then(standing(x, up, z));
+    list.add(new Prop(model, place, x, z, nearestLamps(x, z)));
+  }
+
+  private void lay(List<Prop> list, Decals.Decal decal) {
+    put(list, model(decal.mesh()), decal.x(), 0, decal.z(), 1);
+  }
+
+  private int[] nearestLamps(double x, double z) {
+    return IntStream.range(0, lamps.size())
+        .boxed()
+        .sorted(Comparator.comparingDouble(i -> Math.hypot(lamps.get(i).x - x, lamps.get(i).z - z) - lamps.get(i).range))
+        .limit(4)
+        .mapToInt(i -> i)
+        .toArray();
   }
 
   private void placeLamps() {
@@ -138,32 +163,24 @@ final class Village implements Scene {
   }
 
   private void glow(double x, double z, double radius, int rgb) {
-    glows.add(model(Grounds.glow(x, z, radius, rgb)));
+    lay(glows, decals.glow(x, z, radius, rgb));
   }
 
   private void placeHouses() {
-    int huts = 8;
-    double[] turns = {0.35, 1.1, 1.95, 2.75, 3.5, 4.25, 5.0, 5.75};
-    for (int i = 0; i < huts; i++) {
-      double angle = turns[i] + 0.12 * Math.sin(i * 5.0);
-      double far = 560 + 110 * Noise.hash(i + 401);
-      if (i == 0 || i == 4 || i == 5) {
-        far += 60;
-      }
+    double[] turns = {30, 84, 138, 196, 250, 318};
+    for (int i = 0; i < turns.length; i++) {
+      double angle = Math.toRadians(turns[i]);
+      double far = 690 + 60 * Noise.hash(i + 401);
       double x = Island.VILLAGE_X + far * Math.cos(angle);
       double z = Island.VILLAGE_Z + far * Math.sin(angle);
-      if (Island.pathDistance(x, z) < 190 || Island.riverDistance(x, z) < 330) {
-        continue;
-      }
       double up = Island.height(x, z);
       // The door looks along minus z of the mesh, here towards the fire.
       double facing = Math.atan2(x - Island.VILLAGE_X, z - Island.VILLAGE_Z);
       put(props, model(Carpentry.hut(i, facing, false, false)), x, up, z, 1);
       put(windows, model(Carpentry.hut(i, facing, true, false)), x, up, z, 1);
       put(litWindows, model(Carpentry.hut(i, facing, true, true)), x, up, z, 1);
-      Grounds.shadow(shadows, x, z, 300);
-      double w = 400 + 120 * Noise.hash(i + 31);
-      double cx = w * 0.28;
+      lay(shadows, decals.shadow(x, z, 330));
+      double cx = Carpentry.width(i) * 0.28;
       double cz = 40;
       chimneys.add(new double[] {
         x + cx * Math.cos(facing) + cz * Math.sin(facing), up + 515, z - cx * Math.sin(facing) + cz * Math.cos(facing)
@@ -173,7 +190,7 @@ final class Village implements Scene {
     double z = Island.VILLAGE_Z;
     put(props, model(Carpentry.hearth()), x, Island.height(x, z), z, 1);
     put(props, model(Carpentry.mill()), Island.MILL_X, Island.height(Island.MILL_X, Island.MILL_Z), Island.MILL_Z, 1);
-    Grounds.shadow(shadows, Island.MILL_X, Island.MILL_Z, 260);
+    lay(shadows, decals.shadow(Island.MILL_X, Island.MILL_Z, 260));
   }
 
   private void placeGate() {
@@ -187,18 +204,24 @@ final class Village implements Scene {
       double pz = z + 330 * Math.sin(angle);
       if (Island.pathDistance(px, pz) > 70) {
         put(props, model(Carpentry.column(i)), px, Island.height(px, pz), pz, 1);
-        Grounds.shadow(shadows, px, pz, 80);
+        lay(shadows, decals.shadow(px, pz, 80));
       }
     }
   }
 
   private void placeWaterside() {
-    put(props, model(Carpentry.bridge(420)), 488, 88, Island.BRIDGE_Z, 1);
+    put(props, model(Carpentry.bridge(BRIDGE)), 488, 88, Island.BRIDGE_Z, 1);
     double pierZ = -1750;
     while (Island.height(-330, pierZ) > 44 && pierZ > -3000) {
       pierZ -= 20;
     }
     put(props, model(Carpentry.pier(560)), -330, 0, pierZ + 60, 1);
+    // Rocks around the spring of the fall.
+    for (int i = 0; i < 5; i++) {
+      double x = Island.FALL_X - 96 + 48 * i;
+      double z = 1600 - 10 * Math.abs(i - 2);
+      put(props, model(Carpentry.boulder(i + 70)), x, Island.height(x, z) + 14, z, 0.8 + 0.5 * Noise.hash(i + 570));
+    }
     for (int i = 0; i < 26; i++) {
       double angle = 2 * Math.PI * Noise.hash(i + 500);
       double far = 1700 + 1200 * Noise.hash(i + 530);
@@ -248,7 +271,7 @@ final class Village implements Scene {
       double scale = 0.62 + 0.38 * Noise.hash(i + 9000);
       boolean conifer = up > 230 || wood > 0.60 || x < -900 && Noise.hash(i + 9100) > 0.4;
       put(props, (conifer ? conifers : broadleaves).get(i % 5), x, up, z, scale);
-      Grounds.shadow(shadows, x, z, (conifer ? 135 : 165) * scale);
+      lay(shadows, decals.shadow(x, z, (conifer ? 135 : 165) * scale));
     }
     for (int i = 0; i < 60; i++) {
       double x = -1900 + 3800 * Noise.hash(i * 2 + 6000);
@@ -283,20 +306,33 @@ final class Village implements Scene {
     toolkit.setSun(day.sun());
     burn(seconds);
     resource.begin();
-    draw(land);
+    // The nearest first: what they hide costs little.
+    props.sort(Comparator.comparingDouble(prop -> distance(prop.x, prop.z)));
     props.forEach(this::draw);
     (day.night() > 0.35 ? litWindows : windows).forEach(this::draw);
     drawMill(seconds);
     drawWanderers(seconds);
     drawBoats(seconds);
-    drawBirds(seconds);
-    toolkit.setPointLights(List.of());
-    resource.draw(shadow, Matrix.IDENTITY);
-    if (day.night() > 0.35) {
-      glows.forEach(glow -> resource.draw(glow, Matrix.IDENTITY));
+    if (day.night() < 0.6) {
+      drawBirds(seconds);
     }
-    resource.draw(sea, Matrix.translation(0, -3 * Math.sin(seconds * 0.8), 0));
-    resource.draw(river, Matrix.IDENTITY);
+    land.sort(Comparator.comparingDouble(part -> distance(part.patch.middleX(), part.patch.middleZ())));
+    for (LitPatch part : land) {
+      light(part.lamps);
+      part.patch.draw(resource, pilot.heading(), 0);
+    }
+    flat.forEach(this::draw);
+    toolkit.setPointLights(List.of());
+    for (Prop shadow : shadows) {
+      if (distance(shadow.x, shadow.z) < SHADOWS_END) {
+        resource.draw(shadow.model, shadow.place);
+      }
+    }
+    if (day.night() > 0.35) {
+      glows.forEach(glow -> resource.draw(glow.model, glow.place));
+    }
+    sea.forEach(part -> part.draw(resource, pilot.heading(), 3 * Math.sin(seconds * 0.8)));
+    river.forEach(part -> part.draw(resource, pilot.heading(), 0));
     resource.draw(fall, Matrix.IDENTITY);
     double up = Island.height(Island.MOUND_X, Island.MOUND_Z);
     resource.draw(veil, standing(Island.MOUND_X, up, Island.MOUND_Z));
@@ -308,6 +344,10 @@ final class Village implements Scene {
             .then(standing(Island.VILLAGE_X, Island.height(Island.VILLAGE_X, Island.VILLAGE_Z), Island.VILLAGE_Z)));
     drawPuffs(seconds);
     resource.end();
+  }
+
+  private double distance(double x, double z) {
+    return Math.hypot(x - pilot.x(), z - pilot.z());
   }
 
   /** The lamps as they burn now; none by day. */
@@ -349,17 +389,20 @@ final class Village implements Scene {
   }
 
   private void drawWanderers(double seconds) {
-    light(land.lamps);
+    light(new int[] {0, 1, 2, 3});
     for (int i = 0; i < robes.size(); i++) {
       double pace = seconds / 70 + 0.24 + i * 0.31;
       double[] p = Island.walk(pace - Math.floor(pace));
       double ground = Island.height(p[0], p[1]);
       double across = p[0] - 488;
-      if (Math.abs(across) < 210 && Math.abs(p[1] - Island.BRIDGE_Z) < 60) {
-        ground = Math.max(ground, 88 + 62 * Math.cos(Math.PI * across / 420));
+      if (Math.abs(across) < BRIDGE / 2 && Math.abs(p[1] - Island.BRIDGE_Z) < 60) {
+        ground = Math.max(ground, 88 + Carpentry.arch(across, BRIDGE));
       }
       double stride = Math.sin(seconds * 6 + i);
-      Matrix place = Matrix.rotationY(p[2]).then(standing(p[0], ground + 2 * Math.abs(stride), p[1]));
+      Matrix place =
+          Matrix.scaling(0.84, 0.84, 0.84)
+              .then(Matrix.rotationY(p[2]))
+              .then(standing(p[0], ground + 2 * Math.abs(stride), p[1]));
       resource.draw(robes.get(i), place);
       for (int side = -1; side <= 1; side += 2) {
         resource.draw(leg, Matrix.rotationX(0.5 * stride * side).then(Matrix.translation(13 * side, -72, 0)).then(place));
@@ -385,12 +428,12 @@ final class Village implements Scene {
   private void drawBirds(double seconds) {
     for (int i = 0; i < 9; i++) {
       double t = seconds * 0.13 + i * 0.09 + (i % 3) * 1.9;
-      double far = 700 + 130 * (i % 3) + 25 * i;
+      double far = 480 + 130 * (i % 3) + 25 * i;
       double flap = 0.55 * Math.sin(seconds * 7 + i * 1.3) + 0.12;
       Matrix place =
           Matrix.scaling(0.75, 0.75, 0.75)
               .then(Matrix.rotationY(-t))
-              .then(standing(100 + far * Math.cos(t), 470 + 60 * (i % 3) + 14 * Math.sin(seconds + i), 200 + far * Math.sin(t)));
+              .then(standing(100 + far * Math.cos(t), 780 + 60 * (i % 3) + 14 * Math.sin(seconds + i), 200 + far * Math.sin(t)));
       resource.draw(wing, Matrix.rotationZ(-flap).then(place));
       resource.draw(wing, Matrix.rotationZ(-flap).then(Matrix.scaling(1, 1, -1)).then(Matrix.rotationY(Math.PI)).then(place));
     }
@@ -418,7 +461,7 @@ final class Village implements Scene {
               Island.FALL_X + 220 * (Noise.hash(k + 820) - 0.5), 100 + 80 * life,
               1215 - 60 * Noise.hash(k + 840) - 60 * life));
     }
-    puffs.sort(Comparator.comparingDouble(puff -> -Math.hypot(puff.x - pilot.x(), puff.z - pilot.z())));
+    puffs.sort(Comparator.comparingDouble(puff -> -distance(puff.x, puff.z)));
     Matrix facing = Matrix.rotationY(pilot.heading());
     for (Puff puff : puffs) {
       resource.draw(
