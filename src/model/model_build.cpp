@@ -15,10 +15,7 @@ namespace {
 constexpr int dropped = -1;
 constexpr int goes_untextured = -2;
 
-const texturemetrics* metrics_of(unsigned short texture) {
-  texturecache* const cache = toolkit::m_pInstance->textures;
-  return cache != nullptr ? cache->getmetrics(texture) : nullptr;
-}
+const texturemetrics* metrics_of(unsigned short texture) { return toolkit::m_pInstance->get_texturemetrics(texture); }
 
 // Groups items by label with a counting sort. `item(i, label, member)` answers whether item i has a label, and which
 // label and member it stands for; `items` is asked for twice.
@@ -118,9 +115,8 @@ void model::map_faces(const mesh_views& mesh, face_map& facemap, unsigned short&
   }
   for (int i = 0; i < faces; ++i) {
     if (hidden(i)) continue;
-    const auto id = static_cast<unsigned short>(mesh.ftex.elements[i]);
-    const texturemetrics* const metrics = metrics_of(id);
-    if (id == no_texture || ((flags & MF_NOALPHATEXTURE) != 0 && metrics->flat_colour)) {
+    const texturemetrics* const metrics = metrics_of(static_cast<unsigned short>(mesh.ftex.elements[i]));
+    if (metrics == nullptr || ((flags & MF_NOALPHATEXTURE) != 0 && metrics->flat_colour)) {
       facemap[i] = goes_untextured;
     } else if (!metrics->do_not_draw) {
       facemap[i] = textured++;

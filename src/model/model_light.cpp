@@ -96,11 +96,11 @@ unsigned int model::light_getunlitrgb(unsigned int hsl, unsigned short texture) 
   const unsigned int scaled = ((hsl & 127) * level) >> 7;
   const unsigned int lightness = scaled > 1 ? std::min(scaled, 126u) : 2;
   unsigned int rgb = colourutils::hsl_2_rgb((hsl & 0xFF80) + lightness);
-  if (texture == no_texture) return rgb;
-
-  const texturemetrics& metrics = *toolkit::m_pInstance->textures->getmetrics(texture);
-  if (metrics.grey_blend != 0) rgb = tinted_grey(rgb, level, metrics.grey_blend);
-  if (metrics.brighten != 0) rgb = brightened(rgb, metrics.brighten);
+  // A model can outlive the toolkit that knew its textures.
+  const texturemetrics* const metrics = toolkit::m_pInstance->get_texturemetrics(texture);
+  if (metrics == nullptr) return rgb;
+  if (metrics->grey_blend != 0) rgb = tinted_grey(rgb, level, metrics->grey_blend);
+  if (metrics->brighten != 0) rgb = brightened(rgb, metrics->brighten);
   return rgb;
 }
 

@@ -1,4 +1,5 @@
 // Natives of SseMemoryPool ("ba").
+#include "natives/in_use.h"
 #include "natives/native.h"
 #include "util/memorymanager/memorypool.h"
 
@@ -6,9 +7,11 @@ using namespace natives;
 
 namespace {
 
-// The callback that asks for memory runs inside an allocation, whose pool must outlive it.
-void not_allocating(const memorymanager& pool) {
+// The callback that asks for memory runs inside an allocation, and the one that asks for a texture inside a draw: their
+// pool must outlive them.
+void not_needed(const memorymanager& pool) {
   if (contract::checked && pool.is_allocating()) contract::fail_state("pool: it is in the middle of an allocation");
+  in_use::refuse(pool);
 }
 
 }  // namespace
@@ -26,7 +29,7 @@ VELMARK5_NATIVE(void) Java_ba_ma(JNIEnv* env, jobject peer) {
   frame(env, [&] {
     // Only the storage goes: the weak reference to the peer stays until the process ends.
     if (memorymanager* pool = objconvert::get_memorypool(env, peer); pool != nullptr) {
-      not_allocating(*pool);
+      not_needed(*pool);
       pool->~memorymanager();
       ::operator delete(pool);
     }
@@ -37,7 +40,7 @@ VELMARK5_NATIVE(void) Java_ba_ma(JNIEnv* env, jobject peer) {
 VELMARK5_NATIVE(void) Java_ba_ha(JNIEnv* env, jobject peer) {
   frame(env, [&] {
     memorymanager& pool = contract::object(objconvert::get_memorypool(env, peer));
-    not_allocating(pool);
+    not_needed(pool);
     pool.release_resources();
     objconvert::set_memorypool(env, peer, nullptr);
   });

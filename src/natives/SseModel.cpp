@@ -1,6 +1,7 @@
 // Natives of SseModel ("h"): lifecycle, state and bounds. Building is in SseModel_build.cpp.
 #include "model/model.h"
 
+#include "natives/in_use.h"
 #include "natives/mesh_contract.h"
 #include "natives/native.h"
 #include "util/memorymanager/alignedmemory.h"
@@ -28,6 +29,7 @@ VELMARK5_NATIVE(void) Java_h_ba(JNIEnv* env, jobject peer, jint) {
 VELMARK5_NATIVE(void) Java_h_ma(JNIEnv* env, jobject peer) {
   frame(env, [&] {
     if (model* mesh = objconvert::get_model(env, peer); mesh != nullptr) {
+      in_use::refuse(*mesh);
       mesh->~model();
       _aligned_free(mesh);
     }
@@ -36,7 +38,13 @@ VELMARK5_NATIVE(void) Java_h_ma(JNIEnv* env, jobject peer) {
 }
 
 VELMARK5_NATIVE(void) Java_h_KA(JNIEnv* env, jobject peer, jint mask) {
-  frame(env, [&] { model_of(env, peer).updatefunctionmask(static_cast<unsigned int>(mask)); });
+  frame(env, [&] {
+    current_toolkit();
+    model& mesh = model_of(env, peer);
+    in_use::refuse(mesh);
+    const in_use mark(&mesh);
+    mesh.updatefunctionmask(static_cast<unsigned int>(mask));
+  });
 }
 
 VELMARK5_NATIVE(jint) Java_h_m(JNIEnv* env, jobject peer) {

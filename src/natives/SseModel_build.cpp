@@ -1,6 +1,7 @@
 // The native of SseModel ("h") that builds a model from a decoded mesh.
 #include "model/mesh_views.h"
 #include "model/model.h"
+#include "natives/in_use.h"
 #include "natives/mesh_contract.h"
 #include "natives/native.h"
 #include "util/memorymanager/alignedmemory.h"
@@ -78,8 +79,11 @@ Java_h_U(JNIEnv* env, jobject peer, jobject, jobject poolobject, jint vertexcoun
                           contrast,
                           {env, billboarddata}};
     mesh_contract::check(mesh, scene);
+    const in_use mark;
     auto built = new_model(pool);
     built->build(mesh);
+    // A collection of memory can have failed: its exception is the result then.
+    if (env->ExceptionCheck()) return;
     objconvert::set_model(env, peer, built.release());
   });
 }

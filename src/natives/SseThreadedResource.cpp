@@ -1,4 +1,5 @@
 // Natives of SseThreadedResource ("a"): the per-thread render context.
+#include "natives/in_use.h"
 #include "natives/native.h"
 #include "toolkit/threadresource.h"
 #include "util/memorymanager/alignedmemory.h"
@@ -16,6 +17,7 @@ VELMARK5_NATIVE(void) Java_a_ha(JNIEnv* env, jobject peer, jint, jint, jint, jin
 VELMARK5_NATIVE(void) Java_a_R(JNIEnv* env, jobject peer, jlong handle) {
   frame(env, [&] {
     auto& resource = from_handle<threadresource>(handle);
+    in_use::refuse(resource);
     resource.~threadresource();
     _aligned_free(&resource);
     objconvert::set_threadresource(env, peer, nullptr);

@@ -2,6 +2,7 @@
 #include <utility>
 
 #include "model/model.h"
+#include "natives/in_use.h"
 #include "natives/native.h"
 #include "raster/DepthBuffer.h"
 #include "raster/Rasterizer.h"
@@ -32,6 +33,7 @@ VELMARK5_NATIVE(void) Java_ja_q(JNIEnv* env, jobject peer, jobject texture_sourc
 VELMARK5_NATIVE(void) Java_ja_ma(JNIEnv* env, jobject peer) {
   frame(env, [&] {
     toolkit& instance = contract::object(objconvert::get_toolkit(env, peer));
+    in_use::refuse_toolkit();
     instance.~toolkit();
     _aligned_free(&instance);
     objconvert::set_toolkit(env, peer, nullptr);
@@ -53,6 +55,7 @@ VELMARK5_NATIVE(void) Java_ja_n(JNIEnv* env, jobject, jobject pool) {
 VELMARK5_NATIVE(void) Java_ja_PA(JNIEnv* env, jobject, jobject target) {
   frame(env, [&] {
     toolkit& instance = current_toolkit();
+    in_use::refuse_target();
     if (target == nullptr) {
       instance.set_active_canvas(nullptr);
     } else {
@@ -71,6 +74,7 @@ VELMARK5_NATIVE(void) Java_ja_d(JNIEnv* env, jobject, jlong sprite, jlong depth)
       contract::fail_argument("depth: %ux%u does not fit the sprite's %dx%d", depth_image->width, depth_image->height,
                               image->width, image->height);
     }
+    in_use::refuse_target();
     current_toolkit().start_offscreen_render(image, depth_image);
   });
 }

@@ -52,7 +52,8 @@ constexpr jint release_mode(bool read_only) { return read_only ? JNI_ABORT : 0; 
 template <class T, class A, bool RO>
 class copiedjniarray {
  public:
-  copiedjniarray(JNIEnv* environment, A java_array) : array(java_array), env(environment) {
+  copiedjniarray(JNIEnv* environment, A java_array)
+      : array(java_array), env(environment), elementcount(array_length(environment, java_array)) {
     if (array != nullptr) getElements();
   }
   ~copiedjniarray() {
@@ -80,13 +81,14 @@ class copiedjniarray {
   sharedarray<U> toSharedarray(memorymanager* pool) const {
     static_assert(sizeof(U) == sizeof(T));
     if (array == nullptr) return {};
-    const jint n = env->GetArrayLength(array);
+    const jint n = elementcount;
     auto result = sharedarray<U>::allocate(*pool, static_cast<unsigned int>(n));
     if (n > 0) std::memcpy(result.data(), elements, static_cast<unsigned int>(n) * sizeof(T));
     return result;
   }
 
-  jint length() const { return array_length(env, array); }
+  // Asks no runtime: a callback's exception may be pending.
+  jint length() const { return elementcount; }
 
   jboolean iscopy = JNI_FALSE;
   A array;
@@ -94,6 +96,7 @@ class copiedjniarray {
 
  private:
   JNIEnv* env;
+  jint elementcount;
 };
 
 template <class T, class A, bool RO>

@@ -84,7 +84,8 @@ inline toolkit& current_toolkit() {
   return contract::object(toolkit::m_pInstance);
 }
 
-// Buffers are about to be freed: what is drawn before another target is active must not go to where they were.
+// Buffers are about to be freed: what is drawn before another target is active must not go to where they were. Raises,
+// with nothing changed, when a draw of this thread is under way on them.
 void forget_target(const void* colour, const void* depth);
 
 // Only the value 1 is true.

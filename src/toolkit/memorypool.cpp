@@ -8,4 +8,7 @@ memorypool::memorypool(toolkit& of, jobject peer, unsigned int usable)
 
 memorypool::~memorypool() { owner->get_env()->DeleteWeakGlobalRef(java_peer); }
 
-void memorypool::garbagecollect() { owner->garbagecollect(); }
+void memorypool::garbagecollect() {
+  // A pool that outlives its toolkit has nobody to ask.
+  if (owner == toolkit::live_instance) owner->garbagecollect();
+}

@@ -72,6 +72,8 @@ toolkit::toolkit(JNIEnv* env, jobject peer, jobject texture_source, int texture_
 
 toolkit::~toolkit() {
   if (live_instance == this) live_instance = nullptr;
+  // Thread resources may go later than the ring.
+  while (!threads.isempty()) threads.next->unlink();
   restore_se_handling();
   get_env()->DeleteWeakGlobalRef(java_peer);
   if (textures != nullptr) {
@@ -115,6 +117,10 @@ jobject toolkit::createshadow() {
 
 void toolkit::service(int time) {
   if (textures != nullptr) textures->service(time);
+}
+
+const texturemetrics* toolkit::get_texturemetrics(unsigned short id) const {
+  return textures != nullptr && id < textures->count() ? textures->getmetrics(id) : nullptr;
 }
 
 void toolkit::upload_texturemetrics(unsigned short id, const texturemetrics& fields) {

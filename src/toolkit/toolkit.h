@@ -51,6 +51,8 @@ class alignas(16) toolkit {
   void service(int time);
   void quit() { quit_requested = true; }
 
+  // The attributes of the texture; null for an id that has none.
+  const texturemetrics* get_texturemetrics(unsigned short id) const;
   // Into the texture cache, which must exist.
   void upload_texturemetrics(unsigned short id, const texturemetrics& fields);
   void upload_texture(unsigned short id, const unsigned int* pixels, const texturemetrics& fields);

@@ -55,6 +55,17 @@ class mesh_fixture : public toolkit_fixture {
 
   // --- Meshes -----------------------------------------------------------------------------------------------------
 
+  // One face, which faces the viewer.
+  static Mesh triangle() {
+    Mesh m;
+    m.vertexcount = m.meshvertexcount = 3;
+    m.x = {{-5, 100, -5}}, m.y = {{-60, 60, 60}}, m.z = {{0, 0, 0}};
+    m.inputfacecount = 1;
+    m.a = {{0}}, m.b = {{2}}, m.c = {{1}};
+    m.fhsl = {{0}};
+    return m;
+  }
+
   // drawn: without shading types that leave the colour open, and with billboards that show nothing.
   static Mesh random_mesh(test_random& r, bool drawn, int most_faces = 40) {
     Mesh m;
@@ -90,7 +101,7 @@ class mesh_fixture : public toolkit_fixture {
     if (k > 0 || r.one_in(2)) {
       list(m.fmapping, n, r.one_in(4) ? 2 : 1, [&] { return k == 0 || r.one_in(5) ? -1 : r.between(0, k - 1); });
     }
-    list(m.mappingtype, k, 1, range(0, 4));
+    list(m.mappingtype, k, 1, range(-1, 4));
     for (int axis = 0; axis < 3; ++axis) {
       m.mappingaxis[axis].emplace();
       list(m.mappingscale[axis], k, 1, [&] { return r.between(1, 3000) * (r.one_in(4) ? -1 : 1); });
@@ -198,9 +209,9 @@ class mesh_fixture : public toolkit_fixture {
     }
   }
 
-  struct image {
+  struct texture_image {
     test_random attributes;
     jintArray pixels;
   };
-  std::vector<image> images;
+  std::vector<texture_image> images;
 };
