@@ -56,7 +56,7 @@ void check_vertices(const mesh_views& mesh) {
   }
   const long long points = 3LL * mesh.emittercount + mesh.effectorcount;
   contract::array_holds("pslist", mesh.pslist.length(), points);
-  for (int i = 0; i < mesh.pslist.length(); ++i) in_range("pslist", i, mesh.pslist.elements[i], mesh.vertexcount);
+  for (int i = 0; i < points; ++i) in_range("pslist", i, mesh.pslist.elements[i], mesh.vertexcount);
 }
 
 void check_texture(const char* name, int i, int texture, const toolkit& scene) {
@@ -100,18 +100,29 @@ void check_billboards_and_labels(const mesh_views& mesh, const toolkit& scene) {
   const bool groups_billboards = (mesh.functionmask & FM_ANIMATE_BILLBOARD) != 0 && mesh.billboarddata.array != nullptr;
   const int length = mesh.facelabels.length();
   if (length == 0 || (!groups_faces && !groups_billboards)) return;
-  contract::array_holds("facelabels", length, count);
-  if (length > mesh_views::max_faces) {
+  if (groups_billboards) contract::array_holds("facelabels", length, count);
+  if (groups_faces && length > mesh_views::max_faces) {
     contract::fail_argument("facelabels: length %d is more than %d", length, mesh_views::max_faces);
   }
-  for (int i = 0; i < length; ++i) {
+  for (int i = groups_faces ? 0 : length - count; i < length; ++i) {
     if (mesh.facelabels.elements[i] > max_label) in_range("facelabels", i, mesh.facelabels.elements[i], max_label + 1);
   }
 }
 
-// The mappings count only where some face can have a texture.
-void check_mappings(const mesh_views& mesh) {
-  if (mesh.ftex.array == nullptr || mesh.fmapping.array == nullptr || mesh.inputfacecount <= 0) return;
+// Whether the face has a texture in the model.
+bool keeps_texture(const mesh_views& mesh, const toolkit& scene, int i) {
+  if (mesh.ftype.array != nullptr && mesh.ftype.elements[i] == FT_HIDDEN) return false;
+  const texturemetrics* const metrics = scene.get_texturemetrics(static_cast<unsigned short>(mesh.ftex.elements[i]));
+  if (metrics == nullptr || metrics->do_not_draw) return false;
+  return (mesh.flags & MF_NOALPHATEXTURE) == 0 || !metrics->flat_colour;
+}
+
+void check_mappings(const mesh_views& mesh, const toolkit& scene) {
+  if (mesh.ftex.array == nullptr || mesh.fmapping.array == nullptr) return;
+  const auto textured = [&](int i) { return keeps_texture(mesh, scene, i); };
+  int first = 0;
+  while (first < mesh.inputfacecount && !textured(first)) ++first;
+  if (first >= mesh.inputfacecount) return;
   const int count = std::max(mesh.mappingcount, 0);
   if (count > 0) {
     required("mappingtype", mesh.mappingtype, count);
@@ -131,7 +142,7 @@ void check_mappings(const mesh_views& mesh) {
     const int m = static_cast<unsigned char>(mesh.fmapping.elements[i]);
     if (m == 255) continue;
     in_range("fmapping", i, m, count);
-    if (mesh.mappingtype.elements[m] != 0) continue;
+    if (mesh.mappingtype.elements[m] != 0 || !textured(i)) continue;
     in_range("mappingp", m, mesh.mappingp.elements[m], mesh.vertexcount);
     in_range("mappingm", m, mesh.mappingm.elements[m], mesh.vertexcount);
     in_range("mappingn", m, mesh.mappingn.elements[m], mesh.vertexcount);
@@ -145,7 +156,7 @@ void check(const mesh_views& mesh, const toolkit& scene) {
   check_counts(mesh);
   check_vertices(mesh);
   check_faces(mesh, scene);
-  check_mappings(mesh);
+  check_mappings(mesh, scene);
   check_billboards_and_labels(mesh, scene);
 }
 

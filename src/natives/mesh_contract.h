@@ -1,5 +1,8 @@
 // What the client promises of a mesh: counts within their limits, arrays as long as their counts, and every number in
-// them (vertices, faces, labels, mappings, textures) one that exists.
+// them (vertices, faces, labels, mappings, textures) one that exists. Faces that are not drawn keep the promise too:
+// their vertices and textures are looked at. What no model is made of is not: mappings where no face keeps its texture,
+// the reference points of planes that no textured face lies on, points that are not counted, labels that no function
+// asks for.
 #pragma once
 
 struct mesh_views;

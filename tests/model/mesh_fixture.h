@@ -59,9 +59,9 @@ class mesh_fixture : public toolkit_fixture {
   static Mesh triangle() {
     Mesh m;
     m.vertexcount = m.meshvertexcount = 3;
-    m.x = {{-5, 100, -5}}, m.y = {{-60, 60, 60}}, m.z = {{0, 0, 0}};
+    m.position[0] = {{-5, 100, -5}}, m.position[1] = {{-60, 60, 60}}, m.position[2] = {{0, 0, 0}};
     m.inputfacecount = 1;
-    m.a = {{0}}, m.b = {{2}}, m.c = {{1}};
+    m.corner[0] = {{0}}, m.corner[1] = {{2}}, m.corner[2] = {{1}};
     m.fhsl = {{0}};
     return m;
   }

@@ -13,7 +13,10 @@ class ModelBuildTest : public mesh_fixture {
   template <class T, class U>
   static void same(const char* name, const sharedarray<T>& found, const std::vector<U>& expected) {
     static_assert(sizeof(T) == sizeof(U));
-    if (expected.empty()) return;
+    if (expected.empty()) {
+      EXPECT_EQ(found.count(), 0) << name;
+      return;
+    }
     ASSERT_GE(found.count(), static_cast<int>(expected.size())) << name;
     EXPECT_EQ(std::memcmp(found.data(), expected.data(), expected.size() * sizeof(T)), 0) << name;
   }
@@ -102,6 +105,8 @@ TEST_F(ModelBuildTest, RandomMeshesBecomeTheReferencesModels) {
     oracle::Model o(mesh);
     model& m = get(object);
     same_model(m, o);
+    EXPECT_EQ(std::tuple(m.priority, m.emittercount, m.effectorcount),
+              std::tuple(mesh.priority, mesh.emittercount, mesh.effectorcount));
     textured += o.texfacecount;
     billboards += static_cast<int>(o.billboards.size());
     for (const auto& corner : o.fuv) {
@@ -147,7 +152,8 @@ TEST_F(ModelBuildTest, BrokenPromisesAreRefused) {
   const std::string argument = "java.lang.IllegalArgumentException: ";
   const std::string array = "java.lang.ArrayIndexOutOfBoundsException: ";
   const auto always = [](const Mesh&) { return true; };
-  const auto mapped = [](const Mesh& m) { return m.ftex && m.fmapping && m.inputfacecount > 0 && m.mappingcount > 0; };
+  const auto textured = [](const Mesh& m) { return m.ftex && m.fmapping && oracle::Model(m).texfacecount > 0; };
+  const auto mapped = [textured](const Mesh& m) { return m.mappingcount > 0 && textured(m); };
   const auto outside = [&](int limit) { return r.one_in(2) ? -r.between(1, 30000) : r.between(limit, 32767); };
 
   // A count that `wrong` sets.
@@ -200,6 +206,9 @@ TEST_F(ModelBuildTest, BrokenPromisesAreRefused) {
     promises.push_back({argument + name("mapping", "pmn") + "[", [&, k](Mesh& m) {
                           const int used = mapped(m) ? static_cast<unsigned char>(m.fmapping->front()) : 255;
                           if (used == 255 || (*m.mappingtype)[used] != 0) return false;
+                          (*m.ftex)[0] = textures - 1;
+                          if (m.ftype) (*m.ftype)[0] = 0;
+                          m.flags &= ~MF_NOALPHATEXTURE;
                           (*m.mappingaxis[k])[used] = static_cast<std::int16_t>(outside(m.vertexcount));
                           return true;
                         }});
@@ -215,13 +224,16 @@ TEST_F(ModelBuildTest, BrokenPromisesAreRefused) {
   length("ftex", &Mesh::ftex, always);
   length("fmask", &Mesh::fmask, always);
   promises.push_back({array + "pslist", [](Mesh& m) { return m.effectorcount = 99, true; }});
-  const auto textured = [](const Mesh& m) { return m.ftex.has_value(); };
   const auto vertex_labels = [](const Mesh& m) { return (m.functionmask & 0x20) != 0; };
   const auto face_labels = [](const Mesh& m) { return (m.functionmask & 0x180) != 0; };
   const auto no_label = [&](const Mesh&) { return r.between(256, 0x7FFFFFFF); };
   element("vertexlabels", &Mesh::vertexlabels, vertex_labels, no_label);
   element("facelabels", &Mesh::facelabels, face_labels, no_label);
-  element("pslist", &Mesh::pslist, always, [&](const Mesh& m) { return outside(m.vertexcount); });
+  const auto counted_points = [](Mesh& m) {
+    m.pslist->resize(3 * m.emittercount + m.effectorcount);
+    return !m.pslist->empty();
+  };
+  element("pslist", &Mesh::pslist, counted_points, [&](const Mesh& m) { return outside(m.vertexcount); });
   element("ftex", &Mesh::ftex, always, [&](const Mesh&) { return r.one_in(2) ? r.between(textures, 32767) : -2; });
   element("fmapping", &Mesh::fmapping, textured, [&](const Mesh& m) { return r.between(m.mappingcount, 254); });
   for (const int word : {0, 3}) {
@@ -246,6 +258,48 @@ TEST_F(ModelBuildTest, BrokenPromisesAreRefused) {
   }
   for (std::size_t kind = 0; kind < promises.size(); ++kind) {
     EXPECT_GT(broken[kind], 3) << promises[kind].exception << ", promise " << kind;
+  }
+}
+
+// What no model is made of may hold anything.
+TEST_F(ModelBuildTest, OddMeshesThatAreAllowed) {
+  const auto two_billboards = [](Mesh& m, int mask, std::vector<int> labels) {
+    m.functionmask = mask;
+    m.billboarddata = {{0, 1, 1, -1, 0, 0, 0, 0, 1, 1, -1, 0, 0, 0, 0, 0}};
+    m.facelabels = std::move(labels);
+  };
+  const auto plane = [](Mesh& m) {
+    m.mappingcount = 1;
+    for (auto* list : {&m.mappingtype, &m.mappingrotation, &m.mappingdirection}) *list = {{0}};
+    for (auto& list : m.mappingaxis) list = {{99}};
+    for (auto& list : m.mappingscale) list = {{1}};
+    for (auto& list : m.mappingtranslate) list = {{1}};
+    m.inputfacecount = 2;
+    for (auto& list : m.corner) list->push_back(list->front());
+    m.fhsl = {{1, 2}}, m.fmapping = {{0, -1}}, m.ftex = {{-1, textures - 1}};
+  };
+  const std::function<void(Mesh&)> odd[] = {
+      [](Mesh& m) { m.ftex = {{-1}}, m.fmapping = {{0}}; },
+      [](Mesh& m) { m.ftex = {{-1}}, m.fmapping = {{0}}, m.mappingcount = 1; },
+      [](Mesh& m) { m.ftex = {{1}}, m.ftype = {{2}}, m.fmapping = {{0}}; },
+      [&](Mesh& m) { two_billboards(m, FM_ANIMATE_COLOUR, {1}); },
+      [&](Mesh& m) { two_billboards(m, FM_ANIMATE_BILLBOARD, std::vector<int>(16769, 1)); },
+      [&](Mesh& m) {
+        two_billboards(m, FM_ANIMATE_BILLBOARD, {256, 3, 4});
+      },
+      [](Mesh& m) {
+        m.pslist = {{0, -1}}, m.effectorcount = 1;
+      },
+      plane,
+  };
+  for (const auto& change : odd) {
+    SCOPED_TRACE(&change - odd);
+    Mesh mesh = triangle();
+    change(mesh);
+    const jobject object = build(mesh);
+    ASSERT_EQ(java.take_exception(), "");
+    same_model(get(object), oracle::Model(mesh));
+    Java_h_ma(env, object);
   }
 }
 
