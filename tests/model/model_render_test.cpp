@@ -27,7 +27,7 @@ class ModelRenderTest : public mesh_fixture {
     Java_ja_AA(env, peer, java.new_floats(placed(r.real(-0.1f, 0.1f), r.real(-0.1f, 0.1f), 1, r.real(-9, 9), 5, 0)));
     Java_ja_c(env, peer, colour_word(), r.one_in(3) ? 0 : r.between(1, 1700));
     perspective(50, 1500);
-    Java_ja_IA(env, peer, r.real(0.3f, 1.3f));
+    Java_ja_IA(env, peer, r.one_in(20) ? r.real(-1e6f, 1e6f) : r.real(0.3f, 1.3f));
     Java_ja_m(env, peer, colour_word(), r.real(-0.5f, 1.5f), r.real(-0.5f, 1.5f), r.real(-1, 1), r.real(-1, 1), 0.2f);
     Java_ja_O(env, peer);
     if (r.one_in(2)) Java_ja_M(env, peer, r.between(-250, 250), colour_word(), r.between(60, 900), 0);
@@ -82,11 +82,13 @@ TEST_F(ModelRenderTest, AllVariantsDrawTheReferencesFrames) {
     model& m = get(object);
     const bool with_colour = !r.one_in(4), with_depth = !with_colour || !r.one_in(3);
     for (int again = 0; again < 3 && !HasFailure(); ++again) {
+      Java_ja_Y(env, peer, r.between(0, 128000));  // textures scroll
       random_state(r);
       random_target(r, with_colour, with_depth);
       const std::uint32_t blank_colour = hash_of(colour), blank_depth = hash_of(depth);
       std::vector<unsigned int> slow_colour = colour.copy();
       std::vector<float> slow_depth = depth.copy();
+      if (again == 1 && r.one_in(3)) m.hasalpha = o.hasalpha = false;
       if (again == 2) change_geometry(r, m, o);
 
       const Numbers world = random_place(r);
@@ -219,14 +221,8 @@ TEST_F(ModelRenderTest, ShortPoolsLoseNothing) {
   EXPECT_GT(draws, 5);
 }
 
-// One triangle that faces the viewer, black and flat.
 TEST_F(ModelRenderTest, Quirks) {
-  Mesh mesh;
-  mesh.vertexcount = mesh.meshvertexcount = 3;
-  mesh.position[0] = {{-5, 100, -5}}, mesh.position[1] = {{-60, 60, 60}}, mesh.position[2] = {{0, 0, 0}};
-  mesh.inputfacecount = 1;
-  mesh.corner[0] = {{0}}, mesh.corner[1] = {{2}}, mesh.corner[2] = {{1}};
-  mesh.fhsl = {{0}};
+  Mesh mesh = triangle();
   mesh.ftype = {{1}};
   perspective(50, 1500);
   Java_ja_IA(env, peer, -50);

@@ -153,8 +153,8 @@ unsigned int sunlit(unsigned int rgb, const Vector4_s& n, float factor) {
   const int intensity = truncate(t * 256);
   const unsigned int sun[4] = {k.sun_b, k.sun_g, k.sun_r, 0};
   return 0xFF000000 | word_of([&](int c) {
-           const auto lit = static_cast<std::int64_t>(channel(rgb, c) * sun[c] >> 8) * intensity >> 8;
-           return c == 3 ? 255 : std::clamp<std::int64_t>(lit, 4, 252);
+           const auto product = static_cast<std::int64_t>(channel(rgb, c) * sun[c] >> 8) * intensity;
+           return c == 3 ? 255 : std::clamp(static_cast<std::int32_t>(product) >> 8, 4, 252);  // wraps
          });
 }
 
@@ -335,7 +335,7 @@ void Model::texture_coordinates(const Mesh& mesh, const std::vector<int>& number
       continue;
     }
     const Real3 corners[3] = {point(at(i, 0)), point(at(i, 1)), point(at(i, 2))};
-    float u[3], v[3];
+    float u[3] = {}, v[3] = {};
     if ((*mesh.mappingtype)[m] == 0) {
       const auto spanning = [&](int k) { return point(vpos[(*mesh.mappingaxis[k])[m]]); };
       const Real3 origin = spanning(0), along = spanning(1) - origin, down = spanning(2) - origin;
@@ -344,7 +344,7 @@ void Model::texture_coordinates(const Mesh& mesh, const std::vector<int>& number
         u[k] = static_cast<float>(dot(corners[k] - origin, q) / dot(along, q));
         v[k] = static_cast<float>(dot(corners[k] - origin, r) / dot(down, r));
       }
-    } else {
+    } else if ((*mesh.mappingtype)[m] > 0) {
       const Real3 centre = {(least[m].x + most[m].x) * 0.5f, (least[m].y + most[m].y) * 0.5f,
                             (least[m].z + most[m].z) * 0.5f};
       map_onto(Mapping(mesh, m), corners, centre, u, v);
@@ -464,10 +464,10 @@ int Model::render(const Matrix_c& world, int* result) {
   const bool two_passes = hasalpha;
   for (int pass = 0; pass < (two_passes ? 2 : 1); ++pass) {
     for (int f = 0; f < facecount; ++f) {
-      if (type(f) == 2) continue;
+      const unsigned int alpha = transparency(f);
+      if (type(f) == 2 || alpha == 255) continue;
       if (two_passes) {
-        const unsigned int alpha = transparency(f);
-        if (alpha == 255 || (pass == 0 && alpha != 0)) continue;
+        if (pass == 0 && alpha != 0) continue;
         bool translucent = alpha != 0;
         if (!translucent) {
           const cachedtexture* const texture = gettex(f);
