@@ -205,10 +205,12 @@ TEST_F(ModelBuildTest, BrokenPromisesAreRefused) {
     // The vertices that span a plane.
     promises.push_back({argument + name("mapping", "pmn") + "[", [&, k](Mesh& m) {
                           const int used = mapped(m) ? static_cast<unsigned char>(m.fmapping->front()) : 255;
-                          if (used == 255 || (*m.mappingtype)[used] != 0) return false;
+                          if (used == 255) return false;
                           (*m.ftex)[0] = textures - 1;
                           if (m.ftype) (*m.ftype)[0] = 0;
                           m.flags &= ~MF_NOALPHATEXTURE;
+                          (*m.mappingtype)[used] = 0;
+                          for (auto& point : m.mappingaxis) (*point)[used] = 0;
                           (*m.mappingaxis[k])[used] = static_cast<std::int16_t>(outside(m.vertexcount));
                           return true;
                         }});
