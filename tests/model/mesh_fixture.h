@@ -3,7 +3,9 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cmath>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -29,12 +31,14 @@ class mesh_fixture : public toolkit_fixture {
     Java_a_ha(env, resource_peer, 0, 0, 0, 0, 0);
     ASSERT_EQ(java.take_exception(), "");
     test_random random(77);
-    for (int id = 0; id < textures; ++id) {
-      test_random same = random;
-      attributes(id, random, nullptr);
+    for (jshort id = 0; id < textures; ++id) {
+      texture_image& m = images[id];
+      m.attributes = random_attributes(random, id);
+      std::apply([&](auto... values) { Java_ja_V(env, peer, id, values...); }, m.attributes);
+      if (id == textures - 1) m.attributes[1] = 2;  // it blends, which only its pixels tell
       std::vector<jint> pixels(16384);
       for (jint& p : pixels) p = static_cast<jint>(random.one_in(6) ? 0 : random.word());
-      images.push_back({same, java.new_ints(pixels)});
+      m.pixels = java.new_ints(pixels);
     }
     java.request_texture = [this](jshort id) -> jboolean {
       if (inside_request) inside_request();
@@ -42,8 +46,8 @@ class mesh_fixture : public toolkit_fixture {
         if (refused.empty() || refused.back() != id) refused.push_back(id);
         return 0;
       }
-      test_random same = images[id].attributes;
-      attributes(id, same, images[id].pixels);
+      const texture_image& m = images[id];
+      std::apply([&](auto... values) { Java_ja_F(env, peer, id, m.pixels, values...); }, m.attributes);
       return 1;
     };
   }
@@ -66,11 +70,14 @@ class mesh_fixture : public toolkit_fixture {
     return m;
   }
 
-  // drawn: without shading types that leave the colour open, and with billboards that show nothing.
-  static Mesh random_mesh(test_random& r, bool drawn, int most_faces = 40) {
+  // A drawn mesh leaves no colour open, and its billboards show nothing. A full one has every array, all functions, and
+  // something of each kind.
+  enum mesh_kind { any_mesh, drawn_mesh, full_mesh };
+  static Mesh random_mesh(test_random& r, mesh_kind kind) {
     Mesh m;
-    const auto list = [&r]<class T>(Mesh::array<T>& out, int n, int share, auto value) {
-      if (share > 1 && !r.one_in(share)) return;
+    const int least = kind == full_mesh ? 1 : 0;
+    const auto list = [&r, kind]<class T>(Mesh::array<T>& out, int n, int share, auto value) {
+      if (share > 1 && kind != full_mesh && !r.one_in(share)) return;
       out.emplace();
       for (int i = 0; i < n; ++i) out->push_back(static_cast<T>(value()));
     };
@@ -86,18 +93,21 @@ class mesh_fixture : public toolkit_fixture {
     list(m.vertexlabels, m.vertexcount, 2, range(-2, top_label));
     list(m.vmask, r.between(0, 70), 2, range(-32768, 32767));
 
-    const int n = m.inputfacecount = r.between(drawn ? 1 : 0, most_faces);
+    const int n = m.inputfacecount = r.between(kind == any_mesh ? 0 : 1, 40);
     for (auto& corner : m.corner) list(corner, n, 1, range(0, m.meshvertexcount - 1));
-    list(m.ftype, n, 2, [&] { return r.one_in(5) ? 2 : r.one_in(8) && !drawn ? r.between(3, 255) : r.between(0, 1); });
+    list(m.ftype, n, 2, [&] {
+      return r.one_in(5) ? 2 : r.one_in(8) && kind != drawn_mesh ? r.between(3, 255) : r.between(0, 1);
+    });
     list(m.fpriority, n, 2, range(-128, 127));
     list(m.falpha, n, 2, [&] { return r.one_in(8) ? 255 : r.one_in(2) ? 0 : r.between(1, 254); });
     list(m.fhsl, n, 1, range(-32768, 32767));
     const int first_texture = r.one_in(3) ? textures - 3 : 0;  // the last three do not seem to blend
-    if (!r.one_in(5)) list(m.ftex, n, 1, [&] { return r.one_in(4) ? -1 : r.between(first_texture, textures - 1); });
+    if (kind == full_mesh || !r.one_in(5))
+      list(m.ftex, n, 1, [&] { return r.one_in(4) ? -1 : r.between(first_texture, textures - 1); });
     list(m.fmask, n, 2, range(-32768, 32767));
     m.priority = static_cast<std::int8_t>(r.between(-128, 127));
 
-    const int k = m.mappingcount = r.between(0, 5);
+    const int k = m.mappingcount = r.between(least, 5);
     if (k > 0 || r.one_in(2)) {
       list(m.fmapping, n, r.one_in(4) ? 2 : 1, [&] { return k == 0 || r.one_in(5) ? -1 : r.between(0, k - 1); });
     }
@@ -122,25 +132,29 @@ class mesh_fixture : public toolkit_fixture {
     list(m.mappingrotation, k, 1, range(-128, 127));
     list(m.mappingdirection, k, 1, range(0, 5));
 
-    m.emittercount = r.between(0, 2);
+    m.emittercount = r.between(least, 2);
     m.effectorcount = r.between(0, 2);
     const int points = 3 * m.emittercount + m.effectorcount;
-    list(m.pslist, points + r.between(0, 2), points > 0 ? 1 : 2, range(0, m.vertexcount - 1));
-    m.functionmask = static_cast<int>(r.word() & 0xFFFFF);
+    list(m.pslist, points + (kind == full_mesh ? 0 : r.between(0, 2)), points > 0 ? 1 : 2, range(0, m.vertexcount - 1));
+    m.functionmask = kind == full_mesh ? 0xFFFFF : static_cast<int>(r.word() & 0xFFFFF);
     m.flags = static_cast<int>(r.word());
     m.ambient = r.between(0, 300);
     m.contrast = r.between(200, 2000);
-    const int billboards = n > 0 && r.one_in(2) ? r.between(0, 3) : 0;
+    const int billboards = n > 0 && (kind == full_mesh || r.one_in(2)) ? r.between(least, 3) : 0;
     list(m.billboarddata, billboards * 8 + r.between(0, 7), billboards > 0 ? 1 : 2, [&] { return 0; });
     for (int j = 0; j < billboards; ++j) {
-      const int record[] = {
-          r.between(0, n - 1), r.between(0, 65535), r.between(0, 65535), drawn ? -1 : r.between(0, 41),
-          r.between(0, 4),     r.between(0, 2),     r.between(0, 2)};
+      const int texture = kind == drawn_mesh ? -1 : r.between(0, 41);
+      const int record[] = {r.between(0, n - 1), r.between(0, 65535), r.between(0, 65535), texture,
+                            r.between(0, 4),     r.between(0, 2),     r.between(0, 2)};
       std::copy(std::begin(record), std::end(record), m.billboarddata->begin() + 7 * j);
     }
     // Sometimes labels for fewer faces, or for more things than there are.
-    const int labels = n + billboards + (r.one_in(4) ? r.between(-n, 5) : 0);
+    const int labels = n + billboards + (kind != full_mesh && r.one_in(4) ? r.between(-n, 5) : 0);
     list(m.facelabels, labels, 2, range(-2, top_label));
+    if (kind == full_mesh) {  // and a face with a texture
+      (*m.ftype)[0] = 0, (*m.ftex)[0] = textures - 1;
+      m.flags &= ~MF_NOALPHATEXTURE;
+    }
     return m;
   }
 
@@ -190,28 +204,20 @@ class mesh_fixture : public toolkit_fixture {
   const jobject resource_peer = java.new_object("a");
 
  private:
-  // The attributes of a texture: of its id alone, or with pixels. The last one blends, which only its pixels tell.
-  void attributes(int id, test_random& r, jintArray pixels) {
-    const auto flag = [&r](int n) { return static_cast<jboolean>(r.one_in(n)); };
-    const auto byte = [&r](bool some) { return static_cast<jbyte>(some ? r.between(-128, 127) : 0); };
-    const jint alpha = id == textures - 1 ? (pixels != nullptr ? 2 : 0) : id % 3;
-    const auto hsl = static_cast<jshort>(r.between(-32768, 32767));
-    const jbyte lighting = static_cast<jbyte>(r.one_in(5) ? 6 : 1);
-    const jbyte grey = byte(r.one_in(2)), bright = byte(r.one_in(2)), u = byte(r.one_in(4)), v = byte(r.one_in(4));
-    const jboolean flat = flag(5), hidden = flag(9) != 0 && id < textures - 3, wrap_u = flag(3), wrap_v = flag(3);
-    const jshort name = static_cast<jshort>(id);
-    if (pixels == nullptr) {
-      Java_ja_V(env, peer, name, hsl, alpha, lighting, 0, 0, 0, grey, bright, u, v, flat, hidden, 0, wrap_u, wrap_v, 0,
-                0, 0, 0);
-    } else {
-      Java_ja_F(env, peer, name, pixels, hsl, alpha, lighting, 0, 0, 0, grey, bright, u, v, flat, hidden, 0, wrap_u,
-                wrap_v, 0, 0, 0, 0);
-    }
+  // As the natives take them.
+  using attribute_values = std::array<jint, 19>;
+  static attribute_values random_attributes(test_random& r, int id) {
+    const auto byte = [&r](int one_in) { return r.one_in(one_in) ? r.between(-128, 127) : 0; };
+    const jint hsl = r.between(-32768, 32767), alpha = id == textures - 1 ? 0 : id % 3, lighting = r.one_in(5) ? 6 : 1;
+    const jint grey = byte(2), bright = byte(2), u = byte(4), v = byte(4);
+    const jint flat = r.one_in(5), hidden = r.one_in(9) && id < textures - 3, wrap_u = r.one_in(3),
+               wrap_v = r.one_in(3);
+    return {hsl, alpha, lighting, 0, 0, 0, grey, bright, u, v, flat, hidden, 0, wrap_u, wrap_v};
   }
 
   struct texture_image {
-    test_random attributes;
+    attribute_values attributes;
     jintArray pixels;
   };
-  std::vector<texture_image> images;
+  texture_image images[textures];
 };

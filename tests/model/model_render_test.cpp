@@ -75,7 +75,7 @@ TEST_F(ModelRenderTest, AllVariantsDrawTheReferencesFrames) {
   std::vector<std::uint32_t> hashes;
   for (int n = 0; n < 700; ++n) {
     SCOPED_TRACE(n);
-    const Mesh mesh = random_mesh(r, true);
+    const Mesh mesh = random_mesh(r, drawn_mesh);
     const jobject object = build(mesh);
     ASSERT_EQ(java.take_exception(), "");
     oracle::Model o(mesh);
@@ -129,14 +129,14 @@ TEST_F(ModelRenderTest, RequestsInsideADrawMayMoveAndCloseModels) {
     std::vector<unsigned int> frames[2];
     for (const bool disturbed : {true, false}) {
       test_random r(static_cast<std::uint64_t>(100 + round));
-      const jobject other = build(random_mesh(r, true)), object = build(random_mesh(r, true));
+      const jobject other = build(random_mesh(r, drawn_mesh)), object = build(random_mesh(r, drawn_mesh));
       random_state(r);
       random_target(r);
       if (disturbed) {
         inside_request = [&] {
           ++requests;
           if (java.nativeid(other) != 0) Java_h_ma(env, other);
-          build_into(other, random_mesh(r, true));
+          build_into(other, random_mesh(r, drawn_mesh));
           pool().defragment();
         };
       }
@@ -156,7 +156,7 @@ TEST_F(ModelRenderTest, SteadyFramesAllocateNothing) {
   test_random r(9);
   std::vector<jobject> meshes;
   for (int i = 0; i < 30; ++i) {
-    Mesh mesh = random_mesh(r, true);
+    Mesh mesh = random_mesh(r, drawn_mesh);
     for (std::size_t f = 0; mesh.ftex && f < mesh.ftex->size(); ++f) {
       if ((*mesh.ftex)[f] % undelivered == 0) (*mesh.ftex)[f] = 1;
     }
@@ -181,7 +181,7 @@ TEST_F(ModelRenderTest, SteadyFramesAllocateNothing) {
 TEST_F(ModelRenderTest, ShortPoolsLoseNothing) {
   test_random r(16);
   Mesh mesh;
-  do mesh = random_mesh(r, true);
+  do mesh = random_mesh(r, drawn_mesh);
   while (mesh.inputfacecount < 30 || !mesh.ftype || !mesh.falpha || mesh.mappingcount > 0);
   const Numbers world = placed(2, 0, 1, 0, 0, 350);
   const auto drawn = [&](jobject object) {
@@ -246,7 +246,7 @@ TEST_F(ModelRenderTest, Quirks) {
 
 TEST_F(ModelRenderTest, ModelsOfAPoolThatIsGone) {
   test_random r(4);
-  const jobject object = build(random_mesh(r, true));
+  const jobject object = build(random_mesh(r, drawn_mesh));
   random_target(r);
   const auto frame = colour.copy();
   Java_ba_ma(env, pool_peer);

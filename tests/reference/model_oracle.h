@@ -70,6 +70,8 @@ struct Model {
   // model that is not drawn. result: six ints or null.
   int render(const Matrix_c& world, int* result);
 
+  int type(int f) const { return ftype.empty() ? 0 : ftype[f]; }
+
   unsigned int functionmask, flags;
   int ambient, contrast, meshvertexcount, facecount = 0, texfacecount = 0;
   std::vector<Vector4_s> vpos, vnormal, vsharednormal, fnormal;
@@ -84,7 +86,6 @@ struct Model {
   int radiuscylinder = 0, radiussphere = 0, low[3], high[3];
 
  private:
-  int type(int f) const { return ftype.empty() ? 0 : ftype[f]; }
   unsigned int transparency(int f) const { return falpha.empty() ? 0 : falpha[f]; }
   const cachedtexture* gettex(int f) const;
   void texture_coordinates(const Mesh& mesh, const std::vector<int>& number);
