@@ -228,7 +228,9 @@ public final class Demo {
               console.milliseconds());
         }
         if (shown.count(began, done, last)) {
-          scenes.forEach(scene -> scene.showRate(shown.framesPerSecond(), shown.milliseconds()));
+          String reading =
+              String.format(Locale.ROOT, "%.0f frames/s   %.1f ms", shown.framesPerSecond(), shown.milliseconds());
+          scenes.forEach(scene -> scene.showRate(reading));
         }
         if (picture != null) {
           save(picture);

@@ -1,22 +1,20 @@
 package velmark5.demo;
 
-import java.util.Locale;
 import velmark5.BlendMode;
 import velmark5.ClippingMask;
 import velmark5.Colour;
 import velmark5.Font;
-import velmark5.Glyphs;
 import velmark5.MemoryPool;
-import velmark5.PalettedFont;
 import velmark5.Spans;
 import velmark5.Sprite;
 import velmark5.Toolkit;
 
 /** What lies over the village: its name, figures, help, and a round map that turns with the camera. */
 final class Overlay implements Scene {
-  private static final int BANDS = 12;
+  private static final String HELP = "drag: look   W A S D: move   Q E: down, up   Shift: faster   F: fly";
   private static final int PALE = 0xFFFDF6E8;
   private static final int GOLD = 0xFFFFE0A0;
+  private static final int SHADE = 0xFF140C08;
   private static final int MAP = 256;
   private static final double MAP_REACH = 3300;
 
@@ -26,12 +24,9 @@ final class Overlay implements Scene {
   private final Daylight day;
   private final boolean steered;
   private final Sprite map;
-  private PalettedFont title;
-  private Font body;
-  private Font small;
+  private Lettering letters;
   private ClippingMask disc;
   private String rate = "";
-  private int models;
   private int width;
   private int height;
   private int margin;
@@ -47,24 +42,22 @@ final class Overlay implements Scene {
     for (int i = 0; i < pixels.length; i++) {
       double x = (i % MAP - MAP / 2.0) * 2 * MAP_REACH / MAP;
       double z = (MAP / 2.0 - i / MAP) * 2 * MAP_REACH / MAP;
-      pixels[i] = Village.mapColour(x, z);
+      pixels[i] = mapColour(x, z);
     }
     map = toolkit.createSprite(pixels, MAP, MAP, MAP, true);
   }
 
   @Override
-  public void showRate(double framesPerSecond, double milliseconds) {
-    rate = String.format(Locale.ROOT, "%.0f frames/s   %.1f ms", framesPerSecond, milliseconds);
+  public void showRate(String reading) {
+    rate = reading;
   }
 
   @Override
   public void resize(int newWidth, int newHeight) {
     width = newWidth;
     height = newHeight;
-    if (title != null) {
-      title.close();
-      body.close();
-      small.close();
+    if (letters != null) {
+      letters.close();
       disc.close();
     }
     int least = Math.min(width, height);
@@ -72,39 +65,24 @@ final class Overlay implements Scene {
     radius = Math.max(14, least * 12 / 100);
     disc = toolkit.createMask(pool, Spans.ellipse(2 * radius + 1, 2 * radius + 1));
     int size = Math.max(9, least / 46);
-    int[] palette = new int[BANDS + 2];
-    palette[1] = 0xFF2A1A10;
-    for (int i = 0; i < BANDS; i++) {
-      palette[i + 2] = Colour.mix(0xFFFFFFF4, 0xFFFFB860, i / (BANDS - 1.0));
-    }
-    var bold = new java.awt.Font(java.awt.Font.SANS_SERIF, java.awt.Font.BOLD, size * 3);
-    title = toolkit.createPalettedFont(pool, Glyphs.outlined(bold, Glyphs.LATIN, BANDS), palette);
-    var plain = new java.awt.Font(java.awt.Font.SANS_SERIF, java.awt.Font.BOLD, size);
-    body = toolkit.createSmoothFont(pool, Glyphs.smooth(plain, Glyphs.LATIN));
-    var narrow = new java.awt.Font(java.awt.Font.MONOSPACED, java.awt.Font.BOLD, Math.max(9, size * 4 / 5));
-    small = toolkit.createMonoFont(pool, Glyphs.hard(narrow, Glyphs.LATIN));
+    letters = new Lettering(toolkit, pool, size, java.awt.Font.BOLD, 0xFF2A1A10, 0xFFFFFFF4, 0xFFFFB860);
   }
 
   @Override
   public void paint(double seconds) {
-    models = toolkit.takeModelCount();
-    int step = body.lineHeight() * 5 / 4;
+    int models = toolkit.takeModelCount();
+    int x = margin + 2;
+    int step = letters.body.lineHeight() * 5 / 4;
     int line = height - margin;
-    if (steered) {
-      shadowed("drag: look   W A S D: move   Q E: down, up   Shift: faster   F: fly", margin + 2, line, PALE);
+    if (steered && x + letters.body.width(HELP) < width - 2 * (margin + radius)) {
+      letters.shadowed(HELP, x, line, PALE, SHADE);
       line -= step;
     }
-    shadowed((rate + "   " + models + " models   " + day.clock()).strip(), margin + 2, line, GOLD);
+    letters.shadowed((rate + "   " + models + " models   " + day.clock()).strip(), x, line, GOLD, SHADE);
     line -= step;
-    shadowed(width + " × " + height + ", drawn by the processor alone", margin + 2, line, PALE);
-    title.draw("velmark5", margin, line - step - body.lineHeight() / 4);
+    letters.shadowed(width + " × " + height + ", drawn by the processor alone", x, line, PALE, SHADE);
+    letters.title.draw("velmark5", margin, line - step - letters.body.lineHeight() / 4);
     paintMap();
-  }
-
-  private void shadowed(String text, int x, int y, int colour) {
-    body.draw(text, x + 1, y + 2, 0xC0140C08);
-    body.draw(text, x + 2, y + 1, 0x80140C08);
-    body.draw(text, x, y, colour);
   }
 
   /** The map, turned so that up is where the camera looks, with the camera in its middle. */
@@ -140,13 +118,14 @@ final class Overlay implements Scene {
           centreX - radius, centreY - radius);
     }
     toolkit.fillCircle(centreX, centreY, Math.max(2, radius / 22), 0xFFFFFFFF, BlendMode.REPLACE);
-    String[] letters = {"N", "E", "S", "W"};
+    Font small = letters.small;
+    String[] names = {"N", "E", "S", "W"};
     for (int i = 0; i < 4; i++) {
       double angle = i * Math.PI / 2 - pilot.heading();
-      int x = centreX + (int) Math.round(0.84 * radius * Math.sin(angle)) - small.width(letters[i]) / 2;
+      int x = centreX + (int) Math.round(0.84 * radius * Math.sin(angle)) - small.width(names[i]) / 2;
       int y = centreY - (int) Math.round(0.84 * radius * Math.cos(angle)) + small.ascent() / 3;
-      small.draw(letters[i], x + 1, y + 1, 0xFF101418);
-      small.draw(letters[i], x, y, i == 0 ? 0xFFFFC060 : 0xFFF4F4F4);
+      small.draw(names[i], x + 1, y + 1, 0xFF101418);
+      small.draw(names[i], x, y, i == 0 ? 0xFFFFC060 : 0xFFF4F4F4);
     }
   }
 
@@ -162,5 +141,21 @@ final class Overlay implements Scene {
       toolkit.fillCircle(centreX + (int) right, centreY - (int) ahead, size + 1, 0xFF101418, BlendMode.REPLACE);
       toolkit.fillCircle(centreX + (int) right, centreY - (int) ahead, size, colour, BlendMode.REPLACE);
     }
+  }
+
+  /** The map's colour for a place. */
+  private static int mapColour(double x, double z) {
+    double h = Island.height(x, z);
+    if (h < 0) {
+      return Colour.mix(0xFF2F7088, 0xFF123048, Math.min(1, -h / 120));
+    }
+    if (Island.riverDistance(x, z) < 75 && h < 100) {
+      return 0xFF58B0C8;
+    }
+    if (Island.pathDistance(x, z) < 45) {
+      return 0xFFD8BC88;
+    }
+    int ground = h < 28 ? 0xFFE0CE98 : h > 330 ? Colour.mix(0xFF76885C, 0xFFE8E6E0, (h - 330) / 900) : 0xFF6E9644;
+    return Colour.scale(ground, 1 - 0.35 * Math.min(1, Island.slope(x, z)));
   }
 }

@@ -12,5 +12,5 @@ interface Scene {
   void paint(double seconds);
 
   /** Tells how fast the program is. */
-  default void showRate(double framesPerSecond, double milliseconds) {}
+  default void showRate(String reading) {}
 }

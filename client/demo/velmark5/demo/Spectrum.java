@@ -63,7 +63,7 @@ final class Spectrum implements Scene {
     plot = new Rect(panel.x() + indent, panel.y() + 2 * unit, inner, plotTall);
     past = Rect.between(plot.x(), plot.bottom() + 2 * unit, plot.right(), panel.bottom() - 2 * unit)
         .intersect(new Rect(0, 0, width, height));
-    labelled = Math.max(4, Math.min(plotTall / 3, height / 36));
+    labelled = Math.min(plotTall / 3, Math.max(13, height / 36));
     levels = new double[inner];
     if (waterfall != null) {
       waterfall.close();

@@ -3,8 +3,6 @@ package velmark5.demo;
 import java.util.ArrayList;
 import java.util.Comparator;
 import java.util.List;
-import java.util.stream.IntStream;
-import velmark5.Colour;
 import velmark5.Matrix;
 import velmark5.MemoryPool;
 import velmark5.Mesh;
@@ -25,10 +23,6 @@ final class Village implements Scene {
   /** Shadows farther away are too small to be missed. */
   private static final double SHADOWS_END = 3000;
 
-  private static final double BRIDGE = 440;
-  private static final int FLAME = 0xFF9A3C;
-  private static final int WARM = 0xFFC070;
-  private static final int UNEARTHLY = 0x50C8FF;
 
   private final Toolkit toolkit;
   private final MemoryPool pool;
@@ -36,19 +30,11 @@ final class Village implements Scene {
   private final Pilot pilot;
   private final Daylight day;
 
-  private final List<Lamp> lamps = new ArrayList<>();
-  private final List<Prop> props = new ArrayList<>();
-  private final List<Prop> windows = new ArrayList<>();
-  private final List<Prop> litWindows = new ArrayList<>();
-  private final List<Prop> flat = new ArrayList<>();
-  private final List<Prop> shadows = new ArrayList<>();
-  private final List<Prop> glows = new ArrayList<>();
-  private final List<double[]> chimneys = new ArrayList<>();
+  private final Settlement here;
   private final List<LitPatch> land = new ArrayList<>();
   private final List<Patch> sea = new ArrayList<>();
   private final List<Patch> river = new ArrayList<>();
   private final Model fall;
-  private final Decals decals;
   private final Model sails;
   private final Model boat;
   private final Model flames;
@@ -62,12 +48,7 @@ final class Village implements Scene {
   private int height;
   private List<PointLight> burning = List.of();
 
-  /** A light of the night. */
-  private record Lamp(double x, double up, double z, int range, int colour, double flicker) {}
-
-  /** What stands still, and the numbers of the lamps that are nearest to it. */
-  private record Prop(Model model, Matrix place, double x, double z, int[] lamps) {}
-
+  /** A patch of land, and the numbers of the lamps that are nearest to it. */
   private record LitPatch(Patch patch, int[] lamps) {}
 
   private record Puff(Model model, double size, double x, double up, double z) {}
@@ -79,7 +60,11 @@ final class Village implements Scene {
     this.day = day;
     resource = toolkit.createThreadResource();
     Terrain terrain = new Terrain();
-    decals = new Decals(terrain);
+    here = new Settlement(this::model, new Decals(terrain));
+    for (Patch.Shape shape : terrain.patches()) {
+      Patch patch = new Patch(this::model, shape);
+      land.add(new LitPatch(patch, here.nearestLamps(patch.middleX(), patch.middleZ())));
+    }
     Waters.sea().forEach(shape -> sea.add(new Patch(this::model, shape)));
     Waters.river().forEach(shape -> river.add(new Patch(this::model, shape)));
     fall = model(Waters.fall());
@@ -96,192 +81,15 @@ final class Village implements Scene {
       smoke.add(model(Carpentry.puff(0xE4E0DC, thinness)));
       spray.add(model(Carpentry.puff(0xFFFFFF, thinness)));
     }
-    placeLamps();
-    placeHouses();
-    placeGate();
-    placeWaterside();
-    placeTrees();
-    for (Patch.Shape shape : terrain.patches()) {
-      Patch patch = new Patch(this::model, shape);
-      land.add(new LitPatch(patch, nearestLamps(patch.middleX(), patch.middleZ())));
-    }
-    decals.riverBed().forEach(decal -> lay(flat, decal));
-    lay(flat, decals.square(Island.VILLAGE_X, Island.VILLAGE_Z, 330));
-    for (double[][] path : Island.PATHS) {
-      decals.path(path).forEach(decal -> lay(flat, decal));
-    }
   }
 
   private Model model(Mesh mesh) {
     return toolkit.createModel(pool, mesh, ModelSettings.STANDARD);
   }
 
-  private static Matrix standing(double x, double up, double z) {
+  /** The matrix that moves a model to a place at a height above the sea. */
+  static Matrix standing(double x, double up, double z) {
     return Matrix.translation(x, -up, z);
-  }
-
-  private void put(List<Prop> list, Model model, double x, double up, double z, double scale) {
-    Matrix place = Matrix.scaling(scale, scale, scale).then(standing(x, up, z));
-    list.add(new Prop(model, place, x, z, nearestLamps(x, z)));
-  }
-
-  private void lay(List<Prop> list, Decals.Decal decal) {
-    put(list, model(decal.mesh()), decal.x(), 0, decal.z(), 1);
-  }
-
-  private int[] nearestLamps(double x, double z) {
-    return IntStream.range(0, lamps.size())
-        .boxed()
-        .sorted(Comparator.comparingDouble(i -> Math.hypot(lamps.get(i).x - x, lamps.get(i).z - z) - lamps.get(i).range))
-        .limit(4)
-        .mapToInt(i -> i)
-        .toArray();
-  }
-
-  private void placeLamps() {
-    double x = Island.VILLAGE_X;
-    double z = Island.VILLAGE_Z;
-    lamps.add(new Lamp(x, Island.height(x, z) + 90, z, 720, FLAME, 1));
-    lamps.add(new Lamp(Island.MOUND_X, Island.height(Island.MOUND_X, Island.MOUND_Z) + 210, Island.MOUND_Z - 60, 620, UNEARTHLY, 0.4));
-    glow(x, z, 620, FLAME);
-    glow(Island.MOUND_X, Island.MOUND_Z, 560, UNEARTHLY);
-    double[][] posts = {{300, -190}, {690, -360}, {-490, -800}, {-350, -1420}, {-1010, 60}, {-20, -330}, {1010, -215}, {-340, -2010}};
-    Model post = model(Carpentry.lampPost());
-    Model dark = model(Carpentry.lampGlass(false));
-    Model lit = model(Carpentry.lampGlass(true));
-    for (double[] p : posts) {
-      double ground = Island.height(p[0], p[1]);
-      lamps.add(new Lamp(p[0], ground + 196, p[1], 360, WARM, 0.15));
-      glow(p[0], p[1], 330, WARM);
-    }
-    for (double[] p : posts) {
-      double ground = Island.height(p[0], p[1]);
-      put(props, post, p[0], ground, p[1], 1);
-      put(windows, dark, p[0], ground, p[1], 1);
-      put(litWindows, lit, p[0], ground, p[1], 1);
-    }
-  }
-
-  private void glow(double x, double z, double radius, int rgb) {
-    lay(glows, decals.glow(x, z, radius, rgb));
-  }
-
-  private void placeHouses() {
-    double[] turns = {30, 84, 138, 196, 250, 318};
-    for (int i = 0; i < turns.length; i++) {
-      double angle = Math.toRadians(turns[i]);
-      double far = 690 + 60 * Noise.hash(i + 401);
-      double x = Island.VILLAGE_X + far * Math.cos(angle);
-      double z = Island.VILLAGE_Z + far * Math.sin(angle);
-      double up = Island.height(x, z);
-      // The door looks along minus z of the mesh, here towards the fire.
-      double facing = Math.atan2(x - Island.VILLAGE_X, z - Island.VILLAGE_Z);
-      put(props, model(Carpentry.hut(i, facing, false, false)), x, up, z, 1);
-      put(windows, model(Carpentry.hut(i, facing, true, false)), x, up, z, 1);
-      put(litWindows, model(Carpentry.hut(i, facing, true, true)), x, up, z, 1);
-      lay(shadows, decals.shadow(x, z, 330));
-      double cx = Carpentry.width(i) * 0.28;
-      double cz = 40;
-      chimneys.add(new double[] {
-        x + cx * Math.cos(facing) + cz * Math.sin(facing), up + 515, z - cx * Math.sin(facing) + cz * Math.cos(facing)
-      });
-    }
-    double x = Island.VILLAGE_X;
-    double z = Island.VILLAGE_Z;
-    put(props, model(Carpentry.hearth()), x, Island.height(x, z), z, 1);
-    put(props, model(Carpentry.mill()), Island.MILL_X, Island.height(Island.MILL_X, Island.MILL_Z), Island.MILL_Z, 1);
-    lay(shadows, decals.shadow(Island.MILL_X, Island.MILL_Z, 260));
-  }
-
-  private void placeGate() {
-    double x = Island.MOUND_X;
-    double z = Island.MOUND_Z;
-    double up = Island.height(x, z);
-    put(props, model(Carpentry.gate(false)), x, up, z, 1);
-    for (int i = 0; i < 9; i++) {
-      double angle = 2 * Math.PI * (i + 0.5) / 9 + 0.5;
-      double px = x + 330 * Math.cos(angle);
-      double pz = z + 330 * Math.sin(angle);
-      if (Island.pathDistance(px, pz) > 70) {
-        put(props, model(Carpentry.column(i)), px, Island.height(px, pz), pz, 1);
-        lay(shadows, decals.shadow(px, pz, 80));
-      }
-    }
-  }
-
-  private void placeWaterside() {
-    put(props, model(Carpentry.bridge(BRIDGE)), 488, 88, Island.BRIDGE_Z, 1);
-    double pierZ = -1750;
-    while (Island.height(-330, pierZ) > 44 && pierZ > -3000) {
-      pierZ -= 20;
-    }
-    put(props, model(Carpentry.pier(560)), -330, 0, pierZ + 60, 1);
-    // Rocks around the spring of the fall.
-    for (int i = 0; i < 5; i++) {
-      double x = Island.FALL_X - 96 + 48 * i;
-      double z = 1600 - 10 * Math.abs(i - 2);
-      put(props, model(Carpentry.boulder(i + 70)), x, Island.height(x, z) + 14, z, 0.8 + 0.5 * Noise.hash(i + 570));
-    }
-    for (int i = 0; i < 26; i++) {
-      double angle = 2 * Math.PI * Noise.hash(i + 500);
-      double far = 1700 + 1200 * Noise.hash(i + 530);
-      double x = far * Math.cos(angle);
-      double z = far * Math.sin(angle);
-      double shore = Island.inland(x, z);
-      if (shore > -260 && shore < 420 && Island.riverDistance(x, z) > 150 && Math.abs(x + 330) > 200) {
-        put(props, model(Carpentry.boulder(i)), x, Island.height(x, z), z, 0.8 + 1.1 * Noise.hash(i + 560));
-      }
-    }
-    for (int i = 0; i < 16; i++) {
-      double[] p = Island.RIVER.get(1 + i * 3 % (Island.RIVER.size() - 24));
-      double side = (i % 2 == 0 ? 1 : -1) * (118 + 40 * Noise.hash(i + 580));
-      double x = p[0] + side;
-      put(props, model(Carpentry.boulder(i + 40)), x, Island.height(x, p[1]), p[1], 0.45 + 0.5 * Noise.hash(i + 590));
-    }
-  }
-
-  private void placeTrees() {
-    List<Model> conifers = new ArrayList<>();
-    List<Model> broadleaves = new ArrayList<>();
-    List<Model> bushes = new ArrayList<>();
-    for (int i = 0; i < 5; i++) {
-      conifers.add(model(Carpentry.conifer(i)));
-      broadleaves.add(model(Carpentry.broadleaf(i)));
-      bushes.add(model(Carpentry.bush(i)));
-    }
-    List<double[]> taken = new ArrayList<>();
-    for (int i = 0; i < 2600 && taken.size() < 190; i++) {
-      double x = -2700 + 5400 * Noise.hash(i * 2 + 2000);
-      double z = -2500 + 5000 * Noise.hash(i * 2 + 2001);
-      double up = Island.height(x, z);
-      double wood = Noise.smooth(97, x / 520 + 60, z / 520 + 60);
-      boolean free =
-          up > 46 && up < 800 && Island.slope(x, z) < 0.62 && Island.pathDistance(x, z) > 130
-              && Island.riverDistance(x, z) > 190 && Math.hypot(x - Island.VILLAGE_X, z - Island.VILLAGE_Z) > 960
-              && Math.hypot(x - Island.MOUND_X, z - Island.MOUND_Z) > (z < Island.MOUND_Z ? 820 : 480)
-              && Math.hypot(x - Island.MILL_X, z - Island.MILL_Z) > 300
-              && wood > (z < -900 ? 0.50 : 0.36)
-              && Pilot.wayDistance(x, z) > 230
-              && (z > -1150 || Math.abs(x + 50) > 950)
-              && taken.stream().noneMatch(p -> Math.hypot(p[0] - x, p[1] - z) < 135);
-      if (!free) {
-        continue;
-      }
-      taken.add(new double[] {x, z});
-      double scale = 0.62 + 0.38 * Noise.hash(i + 9000);
-      boolean conifer = up > 230 || wood > 0.60 || x < -900 && Noise.hash(i + 9100) > 0.4;
-      put(props, (conifer ? conifers : broadleaves).get(i % 5), x, up, z, scale);
-      lay(shadows, decals.shadow(x, z, (conifer ? 135 : 165) * scale));
-    }
-    for (int i = 0; i < 60; i++) {
-      double x = -1900 + 3800 * Noise.hash(i * 2 + 6000);
-      double z = -2100 + 3300 * Noise.hash(i * 2 + 6001);
-      double up = Island.height(x, z);
-      if (up > 40 && Island.slope(x, z) < 0.7 && Island.pathDistance(x, z) > 60 && Island.riverDistance(x, z) > 120
-          && Math.hypot(x - Island.VILLAGE_X, z - Island.VILLAGE_Z) > 330) {
-        put(props, bushes.get(i % 5), x, up, z, 0.7 + 0.3 * Noise.hash(i + 6500));
-      }
-    }
   }
 
   static Matrix projection(int width, int height) {
@@ -307,9 +115,9 @@ final class Village implements Scene {
     burn(seconds);
     resource.begin();
     // The nearest first: what they hide costs little.
-    props.sort(Comparator.comparingDouble(prop -> distance(prop.x, prop.z)));
-    props.forEach(this::draw);
-    (day.night() > 0.35 ? litWindows : windows).forEach(this::draw);
+    here.props.sort(Comparator.comparingDouble(prop -> distance(prop.x(), prop.z())));
+    here.props.forEach(this::draw);
+    (day.night() > 0.35 ? here.litWindows : here.windows).forEach(this::draw);
     drawMill(seconds);
     drawWanderers(seconds);
     drawBoats(seconds);
@@ -321,15 +129,15 @@ final class Village implements Scene {
       light(part.lamps);
       part.patch.draw(resource, pilot.heading(), 0);
     }
-    flat.forEach(this::draw);
+    here.flat.forEach(this::draw);
     toolkit.setPointLights(List.of());
-    for (Prop shadow : shadows) {
-      if (distance(shadow.x, shadow.z) < SHADOWS_END) {
-        resource.draw(shadow.model, shadow.place);
+    for (Settlement.Prop shadow : here.shadows) {
+      if (distance(shadow.x(), shadow.z()) < SHADOWS_END) {
+        resource.draw(shadow.model(), shadow.place());
       }
     }
     if (day.night() > 0.35) {
-      glows.forEach(glow -> resource.draw(glow.model, glow.place));
+      here.glows.forEach(glow -> resource.draw(glow.model(), glow.place()));
     }
     sea.forEach(part -> part.draw(resource, pilot.heading(), 3 * Math.sin(seconds * 0.8)));
     river.forEach(part -> part.draw(resource, pilot.heading(), 0));
@@ -354,19 +162,19 @@ final class Village implements Scene {
   private void burn(double seconds) {
     double night = day.night();
     List<PointLight> lights = new ArrayList<>();
-    for (int i = 0; i < lamps.size() && night > 0.05; i++) {
-      Lamp lamp = lamps.get(i);
-      double flicker = 1 - lamp.flicker * 0.22 * (0.5 + 0.5 * Math.sin(seconds * (9 + i) + i * 2) * Math.sin(seconds * 5.3 + i));
+    for (int i = 0; i < here.lamps.size() && night > 0.05; i++) {
+      Settlement.Lamp lamp = here.lamps.get(i);
+      double flicker = 1 - lamp.flicker() * 0.22 * (0.5 + 0.5 * Math.sin(seconds * (9 + i) + i * 2) * Math.sin(seconds * 5.3 + i));
       lights.add(
           new PointLight(
-              (int) lamp.x, (int) -lamp.up, (int) lamp.z, lamp.range, lamp.colour, (float) (night * flicker)));
+              (int) lamp.x(), (int) -lamp.up(), (int) lamp.z(), lamp.range(), lamp.colour(), (float) (night * flicker)));
     }
     burning = lights;
   }
 
-  private void draw(Prop prop) {
-    light(prop.lamps);
-    resource.draw(prop.model, prop.place);
+  private void draw(Settlement.Prop prop) {
+    light(prop.lamps());
+    resource.draw(prop.model(), prop.place());
   }
 
   private void light(int[] numbers) {
@@ -395,8 +203,8 @@ final class Village implements Scene {
       double[] p = Island.walk(pace - Math.floor(pace));
       double ground = Island.height(p[0], p[1]);
       double across = p[0] - 488;
-      if (Math.abs(across) < BRIDGE / 2 && Math.abs(p[1] - Island.BRIDGE_Z) < 60) {
-        ground = Math.max(ground, 88 + Carpentry.arch(across, BRIDGE));
+      if (Math.abs(across) < Settlement.BRIDGE / 2 && Math.abs(p[1] - Island.BRIDGE_Z) < 60) {
+        ground = Math.max(ground, 88 + Carpentry.arch(across, Settlement.BRIDGE));
       }
       double stride = Math.sin(seconds * 6 + i);
       Matrix place =
@@ -442,7 +250,7 @@ final class Village implements Scene {
   /** Puffs turn to the camera and cover what is drawn after them, so the farthest comes first. */
   private void drawPuffs(double seconds) {
     List<Puff> puffs = new ArrayList<>();
-    for (double[] chimney : chimneys) {
+    for (double[] chimney : here.chimneys) {
       for (int k = 0; k < 7; k++) {
         double life = seconds * 0.10 + k / 7.0 + chimney[0] * 0.013;
         life -= Math.floor(life);
@@ -467,21 +275,5 @@ final class Village implements Scene {
       resource.draw(
           puff.model, Matrix.scaling(puff.size, puff.size, puff.size).then(facing).then(standing(puff.x, puff.up, puff.z)));
     }
-  }
-
-  /** A colour for a place on the map, 0xAARRGGBB. */
-  static int mapColour(double x, double z) {
-    double h = Island.height(x, z);
-    if (h < 0) {
-      return Colour.mix(0xFF2F7088, 0xFF123048, Math.min(1, -h / 120));
-    }
-    if (Island.riverDistance(x, z) < 75 && h < 100) {
-      return 0xFF58B0C8;
-    }
-    if (Island.pathDistance(x, z) < 45) {
-      return 0xFFD8BC88;
-    }
-    int ground = h < 28 ? 0xFFE0CE98 : h > 330 ? Colour.mix(0xFF76885C, 0xFFE8E6E0, (h - 330) / 900) : 0xFF6E9644;
-    return Colour.scale(ground, 1 - 0.35 * Math.min(1, Island.slope(x, z)));
   }
 }
