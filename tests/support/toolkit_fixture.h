@@ -1,6 +1,7 @@
 // A toolkit and a pool in a fake Java runtime, and a target to draw into.
 #pragma once
 
+#include <client_natives.h>
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -13,7 +14,6 @@
 #include "natives/jniarray.h"
 #include "raster/Rasterizer.h"
 #include "support/allocation_failure.h"
-#include "support/natives.h"
 #include "support/recording_jni.h"
 #include "toolkit/toolkit.h"
 #include "util/memorymanager/memorymanager.h"
