@@ -9,24 +9,16 @@ import velmark5.Colour;
 import velmark5.Matrix;
 import velmark5.PointLight;
 import velmark5.Rect;
-import velmark5.Spans;
-import velmark5.Sprite;
 import velmark5.Sun;
 import velmark5.TextureMetrics;
 import velmark5.TextureSource;
 import velmark5.ThreadResource;
-import velmark5.Tint;
 import velmark5.Toolkit;
 import velmark5.ToolkitTest;
 import velmark5.Water;
 
-/** Camera, textures, triangles and sprites under any map. */
+/** Camera, scene state, textures, triangles. */
 class SceneTest extends ToolkitTest {
-  private void drawToSquare(int side) {
-    toolkit.drawTo(toolkit.createSprite(side, side), null);
-    toolkit.clear(0);
-  }
-
   @Test
   void theCameraSeesTheWorldUprightAndInOrder() {
     Rect view = new Rect(10, 20, 200, 100);
@@ -125,7 +117,8 @@ class SceneTest extends ToolkitTest {
 
   @Test
   void trianglesAndThickLines() {
-    drawToSquare(16);
+    toolkit.drawTo(toolkit.createSprite(16, 16), null);
+    toolkit.clear(0);
     ThreadResource resource = toolkit.createThreadResource();
     toolkit.setClip(new Rect(4, 0, 8, 16));
     resource.fillTriangle(0, 0, Colour.BLACK, 0, 32, Colour.BLACK, 32, 0, Colour.WHITE);
@@ -144,38 +137,5 @@ class SceneTest extends ToolkitTest {
     assertEquals(0, at(0, 1));
     resource.close();
     refuses(IllegalStateException.class, () -> resource.line(0, 0, 1, 1, -1, 2, BlendMode.REPLACE));
-  }
-
-  @Test
-  void spritesTurnedAndTiled() {
-    int a = 0xFF000001;
-    int b = 0xFF000002;
-    int c = 0xFF000003;
-    int d = 0xFF000004;
-    Sprite sprite = sprite(2, 2, a, b, c, d);
-    drawToSquare(4);
-    sprite.drawAcross(1, 1, 3, 1, 1, 3, Tint.NONE, BlendMode.REPLACE);
-    assertArrayEquals(new int[] {0, 0, 0, 0, 0, a, b, 0, 0, c, d, 0, 0, 0, 0, 0}, pixels());
-    sprite.drawRotated(2, 2, Math.PI / 2, 1, Tint.NONE, BlendMode.REPLACE);
-    int[] turned = {0, 0, 0, 0, 0, c, a, 0, 0, d, b, 0, 0, 0, 0, 0};
-    assertArrayEquals(turned, pixels());
-    sprite.drawAcross(1, 1, 1, 1, 1, 3, Tint.NONE, BlendMode.REPLACE);
-    assertArrayEquals(turned, pixels(), "an area of nothing");
-
-    toolkit.clear(0);
-    var mask = toolkit.createMask(
-        toolkit.createPool(1000), new Spans(4, 4, new int[] {0, 2, 0, 0}, new int[] {4, 1, 4, 4}));
-    sprite.drawAcross(1, 1, 3, 1, 1, 3, mask, 0, 0, BlendMode.REPLACE);
-    assertArrayEquals(new int[] {0, 0, 0, 0, 0, 0, b, 0, 0, c, d, 0, 0, 0, 0, 0}, pixels());
-
-    toolkit.clear(0);
-    toolkit.setClip(new Rect(0, 0, 4, 3));
-    sprite.drawTiled(new Rect(1, 1, 3, 3), Tint.NONE, BlendMode.REPLACE);
-    assertArrayEquals(new int[] {0, 0, 0, 0, 0, a, b, a, 0, c, d, c, 0, 0, 0, 0}, pixels());
-    assertEquals(new Rect(0, 0, 4, 3), toolkit.clip());
-    Sprite empty = toolkit.createSprite(0, 5);
-    refuses(IllegalArgumentException.class,
-        () -> sprite.drawAcross(0, 0, 1, 0, 0, 1, mask, 0, 0, BlendMode.ADD),
-        () -> empty.drawTiled(new Rect(0, 0, 4, 4), Tint.NONE, BlendMode.ALPHA));
   }
 }

@@ -5,8 +5,6 @@ import static org.junit.jupiter.api.Assertions.*;
 import java.util.ArrayList;
 import java.util.Arrays;
 import java.util.List;
-import java.util.concurrent.Callable;
-import java.util.concurrent.Executors;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.function.Executable;
 
@@ -127,28 +125,5 @@ class LifecycleTest extends ToolkitTest {
     }
     assertTrue(seen.contains(thrown));
     assertTrue(toolkit.allocatedBytes() >= 32000, "the pool grew");
-  }
-
-  @Test
-  void eachWorkerHasItsOwnResource() throws Exception {
-    List<Callable<Boolean>> work = new ArrayList<>();
-    for (int i = 0; i < 4; i++) {
-      ThreadResource resource = toolkit.createThreadResource();
-      work.add(() -> {
-        for (int k = 0; k < 1000; k++) {
-          resource.begin();
-          resource.end();
-        }
-        return true;
-      });
-    }
-    var workers = Executors.newFixedThreadPool(4);
-    try {
-      for (var done : workers.invokeAll(work)) {
-        assertTrue(done.get());
-      }
-    } finally {
-      workers.shutdown();
-    }
   }
 }
