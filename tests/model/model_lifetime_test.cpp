@@ -25,7 +25,7 @@ class ModelLifetimeTest : public mesh_fixture {
     return object;
   }
   void use_camera() {
-    Java_ja_ba(env, peer, 2, 0);
+    Java_ja_ba(env, peer, 3, 0);
     Java_ja_GA(env, peer, 0, 1);
     perspective(50, 1500);
   }
