@@ -170,6 +170,7 @@ VELMARK5_LANE Word8 shift_left(Word8 a) {
   return {_mm_slli_epi16(a.v, Bits)};
 }
 VELMARK5_LANE Word8 add_saturating(Word8 a, Word8 b) { return {_mm_adds_epu16(a.v, b.v)}; }
+VELMARK5_LANE Word8 subtract_saturating(Word8 a, Word8 b) { return {_mm_subs_epu16(a.v, b.v)}; }
 
 // The same register seen as the other type.
 VELMARK5_LANE Word8 words(Int4 a) { return {a.v}; }

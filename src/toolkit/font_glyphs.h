@@ -48,7 +48,7 @@ VELMARK5_LANE void plot_upright(const glyph_bitmaps& glyphs, const font_metrics&
                                 const Ink& ink) {
   const upright_glyph g(glyphs, metrics, glyph, x, y);
   if (g.bitmap.bytes == nullptr) return;
-  glyph::draw(*toolkit::m_pInstance, g.x, g.y, g.bitmap.width, g.bitmap.height, ink, glyph::upright_rows(g.bitmap));
+  glyph::draw(*toolkit::m_pInstance, g.x, g.y, g.bitmap, ink);
 }
 
 // The same through a mask; a null mask is none.
@@ -58,8 +58,7 @@ VELMARK5_LANE void plot_upright(const glyph_bitmaps& glyphs, const font_metrics&
   if (mask == nullptr) return plot_upright(glyphs, metrics, glyph, x, y, ink);
   const upright_glyph g(glyphs, metrics, glyph, x, y);
   if (g.bitmap.bytes == nullptr) return;
-  glyph::draw_masked(*toolkit::m_pInstance, g.x, g.y, g.bitmap.width, g.bitmap.height, ink,
-                     glyph::upright_rows(g.bitmap), *mask, mask_x, mask_y);
+  glyph::draw_masked(*toolkit::m_pInstance, g.x, g.y, g.bitmap, ink, *mask, mask_x, mask_y);
 }
 
 // Draws the glyph turned a quarter counter-clockwise; (x, y) is the top left of the turned box.
@@ -67,5 +66,5 @@ template <class Ink>
 void plot_upwards(const glyph_bitmaps& glyphs, const font_metrics& metrics, short glyph, int x, int y, const Ink& ink) {
   const glyph::bitmap bitmap = glyph_bitmap(glyphs, metrics, glyph);
   if (bitmap.bytes == nullptr) return;
-  glyph::draw(*toolkit::m_pInstance, x, y, bitmap.height, bitmap.width, ink, glyph::upward_rows(bitmap));
+  glyph::draw_upwards(*toolkit::m_pInstance, x, y, bitmap, ink);
 }

@@ -59,21 +59,25 @@ struct blended_ink {
   Word8 source, rest;
 };
 
-// Per colour channel, with the glyph byte g as coverage: (d * (256 - g) >> 8) + (c * g >> 8). The alpha byte becomes 0.
+// Per colour channel, with the glyph byte g as coverage: (d * (256 - g) >> 8) + (c * g >> 8). The alpha byte becomes 0,
+// but stays as it was where g is 0. Blue and red stand in one register, green and alpha in the other.
 struct coverage_ink {
-  explicit coverage_ink(unsigned int word) : colour(SSEMath::widen_low_shifted(SSEMath::splat(word & 0xFFFFFF))) {}
+  explicit coverage_ink(unsigned int word)
+      : blue_red(SSEMath::shift_left<8>(SSEMath::words(SSEMath::splat(word)))),
+        green(SSEMath::words(SSEMath::splat(word & 0xFF00u))) {}
   VELMARK5_LANE Int4 operator()(Int4 d, std::uint32_t bytes) const {
-    const Int4 g = byte_pairs(bytes);
-    const Word8 low = blend(SSEMath::widen_low_shifted(d), SSEMath::words(SSEMath::shuffle<0, 0, 1, 1>(g)));
-    const Word8 high = blend(SSEMath::widen_high_shifted(d), SSEMath::words(SSEMath::shuffle<2, 2, 3, 3>(g)));
-    // A hole comes out of this as it was.
-    return SSEMath::narrow(low, high) & (holes(g) | SSEMath::splat(0xFFFFFFu));
+    using namespace SSEMath;
+    const Word8 g = words(byte_pairs(bytes));
+    const Word8 all = splat_word(256);
+    // Of the target's alpha remain 256 parts where g is 0, else none: 256 - 256 * g, but not below 0.
+    const Word8 rest = all - g;
+    const Word8 rest_green = subtract_saturating(all, g * words(splat(0x01000001u)));
+    // The high halves of products whose one factor has been shifted up by 8.
+    const Word8 low = mulhi(shift_left<8>(words(d)), rest) + mulhi(blue_red, g);
+    const Word8 high = mulhi(words(d & splat(0xFF00FF00u)), rest_green) + mulhi(green, g);
+    return pixels(low) | pixels(shift_left<8>(high));
   }
-  // The high halves of products whose one factor has been shifted up by 8.
-  VELMARK5_LANE Word8 blend(Word8 d, Word8 g) const {
-    return SSEMath::mulhi(d, SSEMath::splat_word(256) - g) + SSEMath::mulhi(colour, g);
-  }
-  Word8 colour;
+  Word8 blue_red, green;
 };
 
 // The palette's word; the palette covers every byte of the glyph.
@@ -87,37 +91,19 @@ struct palette_ink {
   const unsigned int* palette;
 };
 
-// --- Rows: where the byte for a screen column comes from -------------------------------------------------------------
-
-// Upright: the bytes of a screen row stand side by side.
-struct upright_rows {
-  explicit upright_rows(const bitmap& b) : bytes(b.bytes), step(b.width) {}
-  const unsigned char* row(std::ptrdiff_t j) const { return bytes + j * step; }
-  VELMARK5_LANE std::uint32_t four(const unsigned char* row, std::ptrdiff_t i) const {
-    std::uint32_t word;
-    std::memcpy(&word, row + i, 4);
-    return word;
-  }
-  VELMARK5_LANE std::uint32_t one(const unsigned char* row, std::ptrdiff_t i) const { return row[i]; }
-  const unsigned char* bytes;
-  std::ptrdiff_t step;  // from row to row
-};
-
-// A quarter turn counter-clockwise: right on the screen is down in the glyph, each lower screen row is one glyph column
-// further to the left.
-struct upward_rows {
-  explicit upward_rows(const bitmap& b) : bytes(b.bytes), stride(b.width) {}
-  const unsigned char* row(std::ptrdiff_t j) const { return bytes + (stride - 1 - j); }
-  VELMARK5_LANE std::uint32_t four(const unsigned char* row, std::ptrdiff_t i) const {
-    return one(row, i) | one(row, i + 1) << 8 | one(row, i + 2) << 16 | one(row, i + 3) << 24;
-  }
-  VELMARK5_LANE std::uint32_t one(const unsigned char* row, std::ptrdiff_t i) const { return row[i * stride]; }
-  const unsigned char* bytes;
-  std::ptrdiff_t stride;
-  static constexpr std::ptrdiff_t step = -1;  // from row to row
-};
-
 // --- Drawing ---------------------------------------------------------------------------------------------------------
+
+// The first of a number of rows of glyph bytes, and how far it is from one to the next.
+struct byte_rows {
+  const unsigned char* first;
+  std::ptrdiff_t step;
+};
+
+VELMARK5_LANE std::uint32_t four_bytes(const unsigned char* from) {
+  std::uint32_t word;
+  std::memcpy(&word, from, 4);
+  return word;
+}
 
 // Four pixels, of which many are holes: much of a letter's box is empty.
 template <class Ink>
@@ -125,26 +111,31 @@ VELMARK5_LANE void draw_four(unsigned int* target, const Ink& ink, std::uint32_t
   if (bytes != 0) SSEMath::store_unaligned(target, ink(SSEMath::load_unaligned(target), bytes));
 }
 
-// Columns `from` up to `to` of a row of the box; target is the pixel of column 0.
-template <class Ink, class Rows>
-VELMARK5_LANE void draw_row(unsigned int* target, const Ink& ink, const Rows& rows, const unsigned char* bytes,
-                            int from, int to) {
-  std::ptrdiff_t i = from;
-  for (; i + 4 <= to; i += 4) draw_four(target + i, ink, rows.four(bytes, i));
-  for (; i < to; ++i) {
-    SSEMath::store_one(target + i, ink(SSEMath::load_one(target + i), rows.one(bytes, i)));
+// Rows of a whole number of groups of four, few enough to be written out.
+template <int Groups, class Ink>
+VELMARK5_LANE void draw_groups(unsigned int* target, std::ptrdiff_t pitch, const Ink& ink, byte_rows rows, int count) {
+  for (; count > 0; --count, target += pitch, rows.first += rows.step) {
+#pragma GCC unroll 4
+    for (int i = 0; i < 4 * Groups; i += 4) draw_four(target + i, ink, four_bytes(rows.first + i));
   }
 }
 
-// Rows of a whole number of groups of four, few enough to be written out.
-template <int Groups, class Ink, class Rows>
-VELMARK5_LANE void draw_groups(unsigned int* target, std::ptrdiff_t pitch, const Ink& ink, const Rows& rows,
-                               const unsigned char* bytes, int from, int count) {
-  target += from;
-  for (; count > 0; --count, target += pitch, bytes += rows.step) {
-    draw_four(target, ink, rows.four(bytes, from));
-    if constexpr (Groups > 1) draw_four(target + 4, ink, rows.four(bytes, from + 4));
-    if constexpr (Groups > 2) draw_four(target + 8, ink, rows.four(bytes, from + 8));
+// A block of width by count pixels from target on, whose bytes are `rows`.
+template <class Ink>
+VELMARK5_LANE void draw_rows(unsigned int* target, std::ptrdiff_t pitch, const Ink& ink, byte_rows rows, int width,
+                             int count) {
+  switch (width) {
+    case 8:
+      return draw_groups<2>(target, pitch, ink, rows, count);
+    case 12:
+      return draw_groups<3>(target, pitch, ink, rows, count);
+    case 16:
+      return draw_groups<4>(target, pitch, ink, rows, count);
+  }
+  for (; count > 0; --count, target += pitch, rows.first += rows.step) {
+    std::ptrdiff_t i = 0;
+    for (; i + 4 <= width; i += 4) draw_four(target + i, ink, four_bytes(rows.first + i));
+    for (; i < width; ++i) SSEMath::store_one(target + i, ink(SSEMath::load_one(target + i), rows.first[i]));
   }
 }
 
@@ -164,50 +155,128 @@ struct visible_part {
   }
 };
 
-// The target's pixel at (x, y); only arithmetic, the place may lie outside.
 inline unsigned int* pixel(const toolkit& t, long long x, long long y) {
   return t.colourbuffer + static_cast<std::ptrdiff_t>(y * t.width + x);
 }
 
-// Draws a box of w by h at (x, y), its pixels taken from `rows`, on the toolkit's target.
-template <class Ink, class Rows>
-void draw(const toolkit& t, long long x, long long y, int w, int h, const Ink& ink, const Rows& rows) {
-  const visible_part part(t, x, y, w, h);
+// Draws the glyph with its top left at (x, y) on the toolkit's target.
+template <class Ink>
+void draw(const toolkit& t, long long x, long long y, const bitmap& glyph, const Ink& ink) {
+  const visible_part part(t, x, y, glyph.width, glyph.height);
   if (part.empty()) return;
-  // The pixel of column 0, though it need not lie in the target.
-  const std::ptrdiff_t pitch = t.width;
-  unsigned int* target = pixel(t, x, y + part.top);
-  const unsigned char* bytes = rows.row(part.top);
-  const int count = part.bottom - part.top;
-  switch (part.right - part.left) {
-    case 8:
-      return draw_groups<2>(target, pitch, ink, rows, bytes, part.left, count);
-    case 12:
-      return draw_groups<3>(target, pitch, ink, rows, bytes, part.left, count);
-  }
-  for (int i = 0; i < count; ++i, target += pitch, bytes += rows.step) {
-    draw_row(target, ink, rows, bytes, part.left, part.right);
-  }
+  const std::ptrdiff_t step = glyph.width;
+  draw_rows(pixel(t, x + part.left, y + part.top), t.width, ink, {glyph.bytes + part.top * step + part.left, step},
+            part.right - part.left, part.bottom - part.top);
 }
 
 // The same within the spans of a mask at (mask_x, mask_y).
-template <class Ink, class Rows>
-void draw_masked(const toolkit& t, long long x, long long y, int w, int h, const Ink& ink, const Rows& rows,
+template <class Ink>
+void draw_masked(const toolkit& t, long long x, long long y, const bitmap& glyph, const Ink& ink,
                  const clippingmask& mask, int mask_x, int mask_y) {
-  const visible_part part(t, x, y, w, h);
+  const visible_part part(t, x, y, glyph.width, glyph.height);
   if (part.empty()) return;
   // The mask's rows, and where its columns begin, counted in the box.
   const long long first = std::max<long long>(part.top, mask_y - y);
   const long long end = std::min<long long>(part.bottom, mask_y - y + mask.rows());
   const long long column = mask_x - x;
-  const int* const starts = mask.starts.data();
-  const int* const lengths = mask.lengths.data();
-  for (long long row = first; row < end; ++row) {
-    const long long mask_row = row - (mask_y - y);
-    const long long start = column + starts[mask_row];
-    const auto from = static_cast<int>(std::clamp<long long>(start, part.left, part.right));
-    const auto to = static_cast<int>(std::clamp<long long>(start + lengths[mask_row], from, part.right));
-    draw_row(pixel(t, x, y + row), ink, rows, rows.row(row), from, to);
+  const int* const starts = mask.starts.data() - (mask_y - y);
+  const int* const lengths = mask.lengths.data() - (mask_y - y);
+  const auto covers = [&](long long row) {
+    const long long start = column + starts[row];
+    return start <= part.left && start + lengths[row] >= part.right;
+  };
+  const auto draw_part = [&](long long row, long long rows, int from, int to) {
+    const std::ptrdiff_t step = glyph.width;
+    draw_rows(pixel(t, x + from, y + row), t.width, ink,
+              {glyph.bytes + static_cast<std::ptrdiff_t>(row) * step + from, step}, to - from, static_cast<int>(rows));
+  };
+  for (long long row = first; row < end;) {
+    // Most glyphs lie well inside: rows that the mask leaves whole are drawn together.
+    long long cut = row;
+    while (cut < end && covers(cut)) ++cut;
+    if (cut > row) draw_part(row, cut - row, part.left, part.right);
+    if (cut < end) {
+      const long long start = column + starts[cut];
+      const auto from = static_cast<int>(std::clamp<long long>(start, part.left, part.right));
+      const auto to = static_cast<int>(std::clamp<long long>(start + lengths[cut], from, part.right));
+      draw_part(cut, 1, from, to);
+    }
+    row = cut + 1;
+  }
+}
+
+// --- Turned glyphs ---------------------------------------------------------------------------------------------------
+
+// A part of a glyph turned a quarter counter-clockwise: right on the screen is down in the glyph, each lower screen row
+// is one glyph column further to the left. The margin takes what blocks of eight by eight write too much.
+class turned_tile {
+ public:
+  static constexpr int columns = 64, rows = 16;  // on the screen
+
+  // From screen column `column` and row `row` of the turned glyph on, w by h.
+  turned_tile(const bitmap& glyph, int column, int row, int w, int h) {
+    for (int j = 0; j < h; j += 8) {
+      for (int i = 0; i < w; i += 8) {
+        if (glyph.width >= 8 && glyph.height >= 8) {
+          // At the glyph's end the last eight, some of them once more.
+          const int at_i = std::min(column + i, glyph.height - 8);
+          const int at_j = std::min(row + j, glyph.width - 8);
+          turn_block(glyph, at_i, at_j, place(at_i - column, at_j - row));
+        } else {
+          for (int y = j; y < std::min(j + 8, h); ++y) {
+            for (int x = i; x < std::min(i + 8, w); ++x) *place(x, y) = turned(glyph, column + x, row + y);
+          }
+        }
+      }
+    }
+  }
+  byte_rows bytes() const { return {at + margin * step + margin, step}; }
+
+ private:
+  static constexpr int margin = 8;
+  static constexpr std::ptrdiff_t step = columns + 2 * margin;
+
+  unsigned char* place(int i, int j) { return at + (j + margin) * step + i + margin; }
+  static unsigned char turned(const bitmap& glyph, int i, int j) {
+    return glyph.bytes[static_cast<std::ptrdiff_t>(i) * glyph.width + (glyph.width - 1 - j)];
+  }
+  // Eight by eight bytes from screen column i and row j on.
+  static void turn_block(const bitmap& glyph, int i, int j, unsigned char* to) {
+    const unsigned char* from = glyph.bytes + static_cast<std::ptrdiff_t>(i) * glyph.width + (glyph.width - 8 - j);
+    __m128i row[8];
+    for (__m128i& eight : row) {
+      eight = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(from));
+      from += glyph.width;
+    }
+    // Columns of two rows, of four, of all eight.
+    const __m128i a = _mm_unpacklo_epi8(row[0], row[1]), b = _mm_unpacklo_epi8(row[2], row[3]);
+    const __m128i c = _mm_unpacklo_epi8(row[4], row[5]), d = _mm_unpacklo_epi8(row[6], row[7]);
+    const __m128i ab_left = _mm_unpacklo_epi16(a, b), ab_right = _mm_unpackhi_epi16(a, b);
+    const __m128i cd_left = _mm_unpacklo_epi16(c, d), cd_right = _mm_unpackhi_epi16(c, d);
+    const auto put = [&](int lower, __m128i two) {
+      _mm_storel_pd(reinterpret_cast<double*>(to + lower * step), _mm_castsi128_pd(two));
+      _mm_storeh_pd(reinterpret_cast<double*>(to + (lower - 1) * step), _mm_castsi128_pd(two));
+    };
+    put(7, _mm_unpacklo_epi32(ab_left, cd_left));
+    put(5, _mm_unpackhi_epi32(ab_left, cd_left));
+    put(3, _mm_unpacklo_epi32(ab_right, cd_right));
+    put(1, _mm_unpackhi_epi32(ab_right, cd_right));
+  }
+
+  unsigned char at[(rows + 2 * margin) * step];
+};
+
+// Draws the turned glyph with its top left at (x, y).
+template <class Ink>
+void draw_upwards(const toolkit& t, long long x, long long y, const bitmap& glyph, const Ink& ink) {
+  const visible_part part(t, x, y, glyph.height, glyph.width);
+  for (int j = part.top; j < part.bottom; j += turned_tile::rows) {
+    const int h = std::min(turned_tile::rows, part.bottom - j);
+    for (int i = part.left; i < part.right; i += turned_tile::columns) {
+      const int w = std::min(turned_tile::columns, part.right - i);
+      const turned_tile tile(glyph, i, j, w, h);
+      draw_rows(pixel(t, x + i, y + j), t.width, ink, tile.bytes(), w, h);
+    }
   }
 }
 
