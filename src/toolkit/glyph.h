@@ -243,14 +243,12 @@ class turned_tile {
   // Eight by eight bytes from screen column i and row j on.
   static void turn_block(const bitmap& glyph, int i, int j, unsigned char* to) {
     const unsigned char* from = glyph.bytes + static_cast<std::ptrdiff_t>(i) * glyph.width + (glyph.width - 8 - j);
-    __m128i row[8];
-    for (__m128i& eight : row) {
-      eight = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(from));
-      from += glyph.width;
-    }
+    const auto row = [&](std::ptrdiff_t k) {
+      return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(from + k * glyph.width));
+    };
     // Columns of two rows, of four, of all eight.
-    const __m128i a = _mm_unpacklo_epi8(row[0], row[1]), b = _mm_unpacklo_epi8(row[2], row[3]);
-    const __m128i c = _mm_unpacklo_epi8(row[4], row[5]), d = _mm_unpacklo_epi8(row[6], row[7]);
+    const __m128i a = _mm_unpacklo_epi8(row(0), row(1)), b = _mm_unpacklo_epi8(row(2), row(3));
+    const __m128i c = _mm_unpacklo_epi8(row(4), row(5)), d = _mm_unpacklo_epi8(row(6), row(7));
     const __m128i ab_left = _mm_unpacklo_epi16(a, b), ab_right = _mm_unpackhi_epi16(a, b);
     const __m128i cd_left = _mm_unpacklo_epi16(c, d), cd_right = _mm_unpackhi_epi16(c, d);
     const auto put = [&](int lower, __m128i two) {
