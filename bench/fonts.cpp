@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
+#include <list>
 #include <string>
 #include <vector>
 
@@ -109,13 +110,19 @@ clippingmask circle(memorymanager& pool) {
   return mask;
 }
 
+// Where a run's circle begins, so that the run goes through its middle.
+int mask_y(const place& at) { return at.y - (run_pixels - glyph_height) / 2; }
+
+std::vector<place> places_of(form shape) {
+  return shape == form::upwards ? places(glyph_height, run_pixels) : places(run_pixels, glyph_height);
+}
+
 template <class Font, form Form>
 void plot(benchmark::State& state, unsigned int colour, bool solid) {
   bench_toolkit frame(target_width, target_height);
   loaded_font<Font> loaded;
   const Font& font = loaded.font;
-  constexpr bool up = Form == form::upwards;
-  const auto list = up ? places(glyph_height, run_pixels) : places(run_pixels, glyph_height);
+  const auto list = places_of(Form);
   const clippingmask mask = circle(loaded.pool);
   for (auto _ : state) {
     for (const place& at : list) {
@@ -124,8 +131,7 @@ void plot(benchmark::State& state, unsigned int colour, bool solid) {
         if constexpr (Form == form::plain) {
           font.plotletter(glyph, at.x + i * advance, at.y, colour, solid);
         } else if constexpr (Form == form::masked) {
-          font.plotletter(glyph, at.x + i * advance, at.y, colour, solid, &mask, at.x,
-                          at.y - (run_pixels - glyph_height) / 2);
+          font.plotletter(glyph, at.x + i * advance, at.y, colour, solid, &mask, at.x, mask_y(at));
         } else {
           font.plotletter_upwards(glyph, at.x, at.y + i * advance, colour, solid);
         }
@@ -148,23 +154,41 @@ void add(const std::string& name, unsigned int colour, bool solid) {
 
 // --- pixman ---------------------------------------------------------------------------------------------------------
 
+// How pixman gets what the library does. A glyph at a time as an A8 image, or a run in one call from its glyph cache,
+// straight to the frame or through a mask of the run. It turns images while it draws them, or the letters are turned
+// beforehand.
+enum class way { image, turning_image, cache, cache_with_mask };
+
 // The letters as A8 images and in a glyph cache, and a solid colour.
 struct pixman_font {
-  explicit pixman_font(unsigned int* pixels, pixman_format_code_t format)
-      : target(pixman_image_create_bits_no_clear(format, target_width, target_height, pixels, target_width * 4)),
+  pixman_font(unsigned int* pixels, pixman_format_code_t format, form shape, way how)
+      : up(shape == form::upwards),
+        target(pixman_image_create_bits_no_clear(format, target_width, target_height, pixels, target_width * 4)),
         cache(pixman_glyph_cache_create()) {
     const pixman_color_t colour{0xE0E0, 0xC0C0, 0x4040, 0xFFFF};
     source = pixman_image_create_solid_fill(&colour);
     pixman_glyph_cache_freeze(cache);
     for (int i = 0; i < run_glyphs; ++i) {
-      pixman_image_t* image = pixman_image_create_bits(PIXMAN_a8, glyph_width, glyph_height, nullptr, glyph_width);
+      const bool turned = up && how != way::turning_image;
+      const int w = turned ? glyph_height : glyph_width, h = turned ? glyph_width : glyph_height;
+      pixman_image_t* image = pixman_image_create_bits(PIXMAN_a8, w, h, nullptr, (w + 3) / 4 * 4);
       auto* bytes = reinterpret_cast<unsigned char*>(pixman_image_get_data(image));
-      const auto shape = letter(i);
-      for (int y = 0; y < glyph_height; ++y) {
-        std::copy_n(shape.data() + y * glyph_width, glyph_width, bytes + y * pixman_image_get_stride(image));
+      const auto shape_bytes = letter(i);
+      for (int y = 0; y < h; ++y) {
+        for (int x = 0; x < w; ++x) {
+          const int from = turned ? x * glyph_width + glyph_width - 1 - y : y * glyph_width + x;
+          bytes[y * pixman_image_get_stride(image) + x] = shape_bytes[static_cast<std::size_t>(from)];
+        }
       }
       images.push_back(image);
-      glyphs.push_back({i * advance, 0, pixman_glyph_cache_insert(cache, this, &images_key[i], 0, 0, image)});
+      if (how == way::turning_image) {
+        constexpr pixman_fixed_t one = pixman_fixed_1;
+        const pixman_transform_t turn = {{{0, -one, glyph_width * one}, {one, 0, 0}, {0, 0, one}}};
+        pixman_image_set_transform(image, &turn);
+        continue;
+      }
+      const void* glyph = pixman_glyph_cache_insert(cache, this, &images_key[i], 0, 0, image);
+      glyphs.push_back({up ? 0 : i * advance, up ? i * advance : 0, glyph});
     }
   }
   ~pixman_font() {
@@ -177,6 +201,28 @@ struct pixman_font {
   pixman_font(const pixman_font&) = delete;
   pixman_font& operator=(const pixman_font&) = delete;
 
+  void draw(way how, int x, int y) {
+    switch (how) {
+      case way::image:
+      case way::turning_image:
+        for (int i = 0; i < run_glyphs; ++i) {
+          pixman_image_composite32(PIXMAN_OP_OVER, source, images[static_cast<std::size_t>(i)], target, 0, 0, 0, 0,
+                                   x + (up ? 0 : i * advance), y + (up ? i * advance : 0),
+                                   up ? glyph_height : glyph_width, up ? glyph_width : glyph_height);
+        }
+        break;
+      case way::cache:
+        pixman_composite_glyphs_no_mask(PIXMAN_OP_OVER, source, target, 0, 0, x, y, cache, run_glyphs, glyphs.data());
+        break;
+      case way::cache_with_mask:
+        pixman_composite_glyphs(PIXMAN_OP_OVER, source, target, PIXMAN_a8, 0, 0, 0, 0, x, y,
+                                up ? glyph_height : run_pixels, up ? run_pixels : glyph_height, cache, run_glyphs,
+                                glyphs.data());
+        break;
+    }
+  }
+
+  bool up;
   pixman_image_t* target;
   pixman_image_t* source;
   pixman_glyph_cache_t* cache;
@@ -185,32 +231,56 @@ struct pixman_font {
   char images_key[run_glyphs] = {};
 };
 
-// Each glyph straight to the frame; through a mask of the whole run first; and as a call for each glyph.
-enum class way { cache, cache_with_mask, image };
+// The spans of a mask at (x, y) as a clip region.
+struct span_region {
+  span_region(const clippingmask& mask, int x, int y) {
+    std::vector<pixman_box32_t> rows;
+    for (int row = 0; row < mask.rows(); ++row) {
+      const int left = x + mask.starts[row];
+      rows.push_back({left, y + row, left + mask.lengths[row], y + row + 1});
+    }
+    pixman_region32_init_rects(&region, rows.data(), static_cast<int>(rows.size()));
+  }
+  ~span_region() { pixman_region32_fini(&region); }
+  span_region(const span_region&) = delete;
+  span_region& operator=(const span_region&) = delete;
 
-template <way Way>
+  pixman_region32_t region;
+};
+
+template <way Way, form Form>
 void pixman(benchmark::State& state, pixman_format_code_t format) {
   bench_toolkit frame(target_width, target_height);
-  pixman_font font(frame.colour, format);
-  const auto list = places(run_pixels, glyph_height);
+  pixman_font font(frame.colour, format, Form, Way);
+  memorymanager pool(1 << 16);
+  const clippingmask mask = circle(pool);
+  const auto list = places_of(Form);
+  // A region lies where the frame does: there is one for each place, made beforehand.
+  std::list<span_region> regions;
+  for (const place& at : list) regions.emplace_back(mask, at.x, mask_y(at));
   for (auto _ : state) {
+    auto clip = regions.begin();
     for (const place& at : list) {
-      if constexpr (Way == way::cache) {
-        pixman_composite_glyphs_no_mask(PIXMAN_OP_OVER, font.source, font.target, 0, 0, at.x, at.y, font.cache,
-                                        run_glyphs, font.glyphs.data());
-      } else if constexpr (Way == way::cache_with_mask) {
-        pixman_composite_glyphs(PIXMAN_OP_OVER, font.source, font.target, PIXMAN_a8, 0, 0, 0, 0, at.x, at.y, run_pixels,
-                                glyph_height, font.cache, run_glyphs, font.glyphs.data());
-      } else {
-        for (int i = 0; i < run_glyphs; ++i) {
-          pixman_image_composite32(PIXMAN_OP_OVER, font.source, font.images[static_cast<std::size_t>(i)], font.target,
-                                   0, 0, 0, 0, at.x + i * advance, at.y, glyph_width, glyph_height);
-        }
-      }
+      if constexpr (Form == form::masked) pixman_image_set_clip_region32(font.target, &clip++->region);
+      font.draw(Way, at.x, at.y);
     }
     benchmark::ClobberMemory();
   }
   report(state);
+}
+
+template <form Form>
+void add_ways(const std::string& form_name) {
+  for (const auto format : {PIXMAN_a8r8g8b8, PIXMAN_x8r8g8b8}) {
+    const std::string suffix = form_name + (format == PIXMAN_a8r8g8b8 ? "/a8r8g8b8" : "/x8r8g8b8");
+    const auto add_way = [&](const std::string& name, auto function) {
+      benchmark::RegisterBenchmark(("fonts/pixman/" + name + suffix).c_str(), function, format);
+    };
+    add_way("image", pixman<way::image, Form>);
+    if (Form == form::upwards) add_way("turning_image", pixman<way::turning_image, Form>);
+    add_way("cache", pixman<way::cache, Form>);
+    add_way("cache_with_mask", pixman<way::cache_with_mask, Form>);
+  }
 }
 
 const bool registered = [] {
@@ -219,15 +289,9 @@ const bool registered = [] {
   add<font_mono>("mono_blended", 0x80E0C040, true);
   add<font_paletted>("paletted", 0xFFE0C040, false);
   add<font_paletted>("paletted_solid", 0xFFE0C040, true);
-  for (const auto format : {PIXMAN_a8r8g8b8, PIXMAN_x8r8g8b8}) {
-    const char* const suffix = format == PIXMAN_a8r8g8b8 ? "/a8r8g8b8" : "/x8r8g8b8";
-    const auto add_way = [&](const std::string& name, auto function) {
-      benchmark::RegisterBenchmark(("fonts/pixman/" + name + suffix).c_str(), function, format);
-    };
-    add_way("glyph_cache", pixman<way::cache>);
-    add_way("run_mask", pixman<way::cache_with_mask>);
-    add_way("a8_image", pixman<way::image>);
-  }
+  add_ways<form::plain>("/plain");
+  add_ways<form::masked>("/masked");
+  add_ways<form::upwards>("/upwards");
   return true;
 }();
 

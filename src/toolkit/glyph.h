@@ -132,27 +132,34 @@ VELMARK5_LANE void draw_rows(unsigned int* target, std::ptrdiff_t pitch, const I
     case 16:
       return draw_groups<4>(target, pitch, ink, rows, count);
   }
+  const std::ptrdiff_t groups = width & -4;
+  const int left = width - static_cast<int>(groups);
   for (; count > 0; --count, target += pitch, rows.first += rows.step) {
-    std::ptrdiff_t i = 0;
-    for (; i + 4 <= width; i += 4) draw_four(target + i, ink, four_bytes(rows.first + i));
-    for (; i < width; ++i) SSEMath::store_one(target + i, ink(SSEMath::load_one(target + i), rows.first[i]));
+    for (std::ptrdiff_t i = 0; i < groups; i += 4) draw_four(target + i, ink, four_bytes(rows.first + i));
+    if (left > 0 && groups > 0) {
+      // The row's last four, of which those that are drawn already count as holes.
+      const int drawn = 8 * (4 - left);
+      draw_four(target + width - 4, ink, four_bytes(rows.first + width - 4) >> drawn << drawn);
+    } else {
+      for (int i = 0; i < left; ++i) SSEMath::store_one(target + i, ink(SSEMath::load_one(target + i), rows.first[i]));
+    }
   }
 }
 
 // The part of a box of w by h at (x, y) that the clip rectangle leaves, in the box's own columns and rows.
 struct visible_part {
-  visible_part(const toolkit& t, long long x, long long y, int w, int h)
-      : left(cut(t.clip_x0 - x, w)),
-        top(cut(t.clip_y0 - y, h)),
-        right(cut(t.clip_x1 - x, w)),
-        bottom(cut(t.clip_y1 - y, h)) {}
+  visible_part(const toolkit& t, long long x, long long y, int w, int h) : left(0), top(0), right(w), bottom(h) {
+    if (x >= t.clip_x0 && y >= t.clip_y0 && x + w <= t.clip_x1 && y + h <= t.clip_y1) return;
+    left = cut(t.clip_x0 - x, w);
+    top = cut(t.clip_y0 - y, h);
+    right = cut(t.clip_x1 - x, w);
+    bottom = cut(t.clip_y1 - y, h);
+  }
   bool empty() const { return left >= right || top >= bottom; }
   int left, top, right, bottom;
 
  private:
-  static int cut(long long edge, int size) {
-    return static_cast<int>(std::clamp<long long>(edge, 0, std::max(size, 0)));
-  }
+  static int cut(long long edge, int size) { return static_cast<int>(std::clamp<long long>(edge, 0, size)); }
 };
 
 inline unsigned int* pixel(const toolkit& t, long long x, long long y) {
@@ -175,33 +182,35 @@ void draw_masked(const toolkit& t, long long x, long long y, const bitmap& glyph
                  const clippingmask& mask, int mask_x, int mask_y) {
   const visible_part part(t, x, y, glyph.width, glyph.height);
   if (part.empty()) return;
-  // The mask's rows, and where its columns begin, counted in the box.
-  const long long first = std::max<long long>(part.top, mask_y - y);
-  const long long end = std::min<long long>(part.bottom, mask_y - y + mask.rows());
-  const long long column = mask_x - x;
-  const int* const starts = mask.starts.data() - (mask_y - y);
-  const int* const lengths = mask.lengths.data() - (mask_y - y);
-  const auto covers = [&](long long row) {
-    const long long start = column + starts[row];
-    return start <= part.left && start + lengths[row] >= part.right;
+  // Where the mask begins, and its rows, counted in the box.
+  const long long mask_left = mask_x - x;
+  const long long mask_top = mask_y - y;
+  const long long first = std::max<long long>(part.top, mask_top);
+  const long long end = std::min<long long>(part.bottom, mask_top + mask.rows());
+  const int* const starts = mask.starts.data();
+  const int* const lengths = mask.lengths.data();
+  const long long left = part.left - mask_left;
+  const long long right = part.right - mask_left;
+  const auto whole = [&](long long row) {
+    const long long start = starts[row - mask_top];
+    return start <= left && start + lengths[row - mask_top] >= right;
   };
   const auto draw_part = [&](long long row, long long rows, int from, int to) {
     const std::ptrdiff_t step = glyph.width;
     draw_rows(pixel(t, x + from, y + row), t.width, ink,
               {glyph.bytes + static_cast<std::ptrdiff_t>(row) * step + from, step}, to - from, static_cast<int>(rows));
   };
-  for (long long row = first; row < end;) {
+  for (long long row = first; row < end; ++row) {
     // Most glyphs lie well inside: rows that the mask leaves whole are drawn together.
-    long long cut = row;
-    while (cut < end && covers(cut)) ++cut;
-    if (cut > row) draw_part(row, cut - row, part.left, part.right);
-    if (cut < end) {
-      const long long start = column + starts[cut];
+    const long long begin = row;
+    while (row < end && whole(row)) ++row;
+    if (row > begin) draw_part(begin, row - begin, part.left, part.right);
+    if (row < end) {
+      const long long start = mask_left + starts[row - mask_top];
       const auto from = static_cast<int>(std::clamp<long long>(start, part.left, part.right));
-      const auto to = static_cast<int>(std::clamp<long long>(start + lengths[cut], from, part.right));
-      draw_part(cut, 1, from, to);
+      const auto to = static_cast<int>(std::clamp<long long>(start + lengths[row - mask_top], from, part.right));
+      draw_part(row, 1, from, to);
     }
-    row = cut + 1;
   }
 }
 
@@ -215,18 +224,18 @@ class turned_tile {
 
   // From screen column `column` and row `row` of the turned glyph on, w by h.
   turned_tile(const bitmap& glyph, int column, int row, int w, int h) {
+    if (glyph.width < 8 || glyph.height < 8) {
+      for (int j = 0; j < h; ++j) {
+        for (int i = 0; i < w; ++i) *place(i, j) = *source(glyph, column + i, row + j);
+      }
+      return;
+    }
     for (int j = 0; j < h; j += 8) {
+      // At the glyph's end the last eight, some of them once more.
+      const int at_j = std::min(row + j, glyph.width - 8);
       for (int i = 0; i < w; i += 8) {
-        if (glyph.width >= 8 && glyph.height >= 8) {
-          // At the glyph's end the last eight, some of them once more.
-          const int at_i = std::min(column + i, glyph.height - 8);
-          const int at_j = std::min(row + j, glyph.width - 8);
-          turn_block(glyph, at_i, at_j, place(at_i - column, at_j - row));
-        } else {
-          for (int y = j; y < std::min(j + 8, h); ++y) {
-            for (int x = i; x < std::min(i + 8, w); ++x) *place(x, y) = turned(glyph, column + x, row + y);
-          }
-        }
+        const int at_i = std::min(column + i, glyph.height - 8);
+        turn_block(source(glyph, at_i, at_j + 7), glyph.width, place(at_i - column, at_j - row));
       }
     }
   }
@@ -237,14 +246,14 @@ class turned_tile {
   static constexpr std::ptrdiff_t step = columns + 2 * margin;
 
   unsigned char* place(int i, int j) { return at + (j + margin) * step + i + margin; }
-  static unsigned char turned(const bitmap& glyph, int i, int j) {
-    return glyph.bytes[static_cast<std::ptrdiff_t>(i) * glyph.width + (glyph.width - 1 - j)];
+  // The byte that turns to screen column i and row j.
+  static const unsigned char* source(const bitmap& glyph, int i, int j) {
+    return glyph.bytes + static_cast<std::ptrdiff_t>(i) * glyph.width + (glyph.width - 1 - j);
   }
-  // Eight by eight bytes from screen column i and row j on.
-  static void turn_block(const bitmap& glyph, int i, int j, unsigned char* to) {
-    const unsigned char* from = glyph.bytes + static_cast<std::ptrdiff_t>(i) * glyph.width + (glyph.width - 8 - j);
+  // Eight rows of eight bytes, `pitch` apart.
+  static void turn_block(const unsigned char* from, std::ptrdiff_t pitch, unsigned char* to) {
     const auto row = [&](std::ptrdiff_t k) {
-      return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(from + k * glyph.width));
+      return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(from + k * pitch));
     };
     // Columns of two rows, of four, of all eight.
     const __m128i a = _mm_unpacklo_epi8(row(0), row(1)), b = _mm_unpacklo_epi8(row(2), row(3));
