@@ -105,45 +105,75 @@ VELMARK5_LANE std::uint32_t four_bytes(const unsigned char* from) {
   return word;
 }
 
+// The n bytes before `end`, 1 to 3, of a row of `width`.
+VELMARK5_LANE std::uint32_t few_bytes(const unsigned char* end, int n, int width) {
+  if (width >= 4) return four_bytes(end - 4) >> (8 * (4 - n));
+  std::uint32_t word = end[-1];
+  if (n > 1) word = word << 8 | end[-2];
+  if (n > 2) word = word << 8 | end[-3];
+  return word;
+}
+
+// 1 to 3 pixels in the lowest lanes.
+VELMARK5_LANE Int4 load_few(const unsigned int* from, int n) {
+  if (n == 1) return SSEMath::load_one(from);
+  const Int4 two{_mm_loadl_epi64(reinterpret_cast<const __m128i*>(from))};
+  return n == 2 ? two : SSEMath::join_low(two, SSEMath::load_one(from + 2));
+}
+VELMARK5_LANE void store_few(unsigned int* to, int n, Int4 pixels) {
+  if (n == 1) return SSEMath::store_one(to, pixels);
+  _mm_storel_epi64(reinterpret_cast<__m128i*>(to), pixels.v);
+  if (n == 3) SSEMath::store_one(to + 2, SSEMath::shuffle<2, 2, 2, 2>(pixels));
+}
+
 // Four pixels, of which many are holes: much of a letter's box is empty.
 template <class Ink>
 VELMARK5_LANE void draw_four(unsigned int* target, const Ink& ink, std::uint32_t bytes) {
   if (bytes != 0) SSEMath::store_unaligned(target, ink(SSEMath::load_unaligned(target), bytes));
 }
 
-// Rows of a whole number of groups of four, few enough to be written out.
-template <int Groups, class Ink>
-VELMARK5_LANE void draw_groups(unsigned int* target, std::ptrdiff_t pitch, const Ink& ink, byte_rows rows, int count) {
+// Rows of some groups of four and, if Odd, up to three pixels more. Groups is how many, or negative if only the width
+// tells.
+template <int Groups, bool Odd, class Ink>
+VELMARK5_LANE void draw_groups(unsigned int* target, std::ptrdiff_t pitch, const Ink& ink, byte_rows rows, int width,
+                               int count) {
+  const std::ptrdiff_t even = width & -4;
   for (; count > 0; --count, target += pitch, rows.first += rows.step) {
-#pragma GCC unroll 4
-    for (int i = 0; i < 4 * Groups; i += 4) draw_four(target + i, ink, four_bytes(rows.first + i));
+    const auto group = [&](std::ptrdiff_t i) { draw_four(target + i, ink, four_bytes(rows.first + i)); };
+    if constexpr (Groups < 0) {
+      for (std::ptrdiff_t i = 0; i < even; i += 4) group(i);
+    }
+    if constexpr (Groups > 0) group(0);
+    if constexpr (Groups > 1) group(4);
+    if constexpr (Groups > 2) group(8);
+    if constexpr (Groups > 3) group(12);
+    if constexpr (Odd) {
+      const std::uint32_t bytes = few_bytes(rows.first + width, width % 4, width);
+      if (bytes != 0) store_few(target + even, width % 4, ink(load_few(target + even, width % 4), bytes));
+    }
   }
 }
 
-// A block of width by count pixels from target on, whose bytes are `rows`.
+// A block of width by count pixels from target on, whose bytes are `rows`. Widths of letters are written out.
 template <class Ink>
 VELMARK5_LANE void draw_rows(unsigned int* target, std::ptrdiff_t pitch, const Ink& ink, byte_rows rows, int width,
                              int count) {
-  switch (width) {
-    case 8:
-      return draw_groups<2>(target, pitch, ink, rows, count);
-    case 12:
-      return draw_groups<3>(target, pitch, ink, rows, count);
-    case 16:
-      return draw_groups<4>(target, pitch, ink, rows, count);
+#define VELMARK5_WIDTH(groups)                                                               \
+  return width % 4 == 0 ? draw_groups<groups, false>(target, pitch, ink, rows, width, count) \
+                        : draw_groups<groups, true>(target, pitch, ink, rows, width, count)
+  switch (width / 4) {
+    case 1:
+      VELMARK5_WIDTH(1);
+    case 2:
+      VELMARK5_WIDTH(2);
+    case 3:
+      VELMARK5_WIDTH(3);
+    case 4:
+      VELMARK5_WIDTH(4);
+    default:
+      VELMARK5_WIDTH(-1);
   }
-  const std::ptrdiff_t groups = width & -4;
-  const int left = width - static_cast<int>(groups);
-  for (; count > 0; --count, target += pitch, rows.first += rows.step) {
-    for (std::ptrdiff_t i = 0; i < groups; i += 4) draw_four(target + i, ink, four_bytes(rows.first + i));
-    if (left > 0 && groups > 0) {
-      // The row's last four, of which those that are drawn already count as holes.
-      const int drawn = 8 * (4 - left);
-      draw_four(target + width - 4, ink, four_bytes(rows.first + width - 4) >> drawn << drawn);
-    } else {
-      for (int i = 0; i < left; ++i) SSEMath::store_one(target + i, ink(SSEMath::load_one(target + i), rows.first[i]));
-    }
-  }
+#undef VELMARK5_WIDTH
 }
 
 // The part of a box of w by h at (x, y) that the clip rectangle leaves, in the box's own columns and rows.
