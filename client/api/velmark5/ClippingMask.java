@@ -16,6 +16,7 @@ public interface ClippingMask extends AutoCloseable {
    */
   int height();
 
+  /** Gives the memory back to the pool. */
   @Override
   void close();
 }

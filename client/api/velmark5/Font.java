@@ -76,6 +76,7 @@ public interface Font extends AutoCloseable {
     return glyphs().ascent();
   }
 
+  /** Gives the memory back to the pool. */
   @Override
   void close();
 }

@@ -5,7 +5,12 @@ package velmark5;
  * is not enough the toolkit's memory pressure listener is called, and then the pool grows.
  */
 public interface MemoryPool extends AutoCloseable {
-  /** Gives the memory back. Objects that still live in the pool draw nothing from then on and may be closed later. */
+  /**
+   * Gives the memory back. What still lives in the pool may be closed later; until then fonts and masks draw nothing, and
+   * to draw a model is an {@link IllegalStateException}.
+   *
+   * @throws IllegalStateException inside a memory pressure listener
+   */
   @Override
   void close();
 

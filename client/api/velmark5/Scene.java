@@ -21,7 +21,7 @@ public interface Scene {
   /**
    * Sets the light that is everywhere.
    *
-   * @param level about 1
+   * @param level its strength: 0 dark, 1 the colours as they are
    */
   void setAmbient(float level);
 
@@ -33,17 +33,19 @@ public interface Scene {
   void setSun(Sun sun);
 
   /**
-   * Sets the fog of the distance.
+   * Sets the fog of the distance. Fog grows from where it begins to the far plane, where nothing else is seen. Before the
+   * first call it is black and begins 255 units before the far plane. A model is in it as a whole or not at all, see {@link
+   * ThreadResource#draw}.
    *
    * @param colour what far things fade to, 0xRRGGBB
-   * @param depth how far before the far plane fog begins; negative counts as 0
+   * @param depth how far before the far plane fog begins, in units of the world; 0 or less for no fog
    */
   void setFog(int colour, int depth);
 
   /**
-   * Sets the lamps that models are lit by.
+   * Sets the lamps that light the models drawn from now on, those that were built to take their light.
    *
-   * @param lights the lamps; only the first four count
+   * @param lights the lamps; only the first four count, none is allowed
    */
   void setPointLights(List<PointLight> lights);
 

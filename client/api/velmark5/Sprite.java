@@ -116,7 +116,8 @@ public interface Sprite extends AutoCloseable {
    * every pixel is drawn.
    *
    * @param box where the full image goes
-   * @param depth the sprite's depth, compared with the stored depths: 0 is at the very front
+   * @param depth the sprite's depth in the units of {@link Toolkit#setDepthRange}: it is drawn where the stored depth is not
+   *     smaller. A range of 0 to 1 leaves only 0, in front of everything; a wider one gives whole numbers a meaning
    * @param tint a change of colours on the way
    * @param mode how the result combines with the frame
    */

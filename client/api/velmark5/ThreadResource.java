@@ -3,24 +3,30 @@ package velmark5;
 import java.util.Optional;
 
 /**
- * What one thread needs to draw models, terrain and triangles. Each worker thread of the client has its own. Made and
+ * What one thread needs to draw models, triangles and thick lines. Each worker thread of the client has its own. Made and
  * closed on the control thread, used by one thread at a time.
+ *
+ * <p>Nothing here locks, so this is what several threads may draw at the same time, into different pixels of the target,
+ * while the control thread changes nothing: triangles, lines, and models without textures that have been drawn before.
+ * The first draw of a model takes memory of its pool, and a textured face moves its texture in the list of those used
+ * last: both belong to one thread at a time.
  */
 public interface ThreadResource extends AutoCloseable {
-  /** Tells the library that the calling thread starts to draw with this resource. Call it on the worker thread. */
+  /** Tells the library that the calling thread starts to draw with this resource. Call it on the thread that draws. */
   void begin();
 
   /** Tells the library that the calling thread has done its drawing with this resource. */
   void end();
 
   /**
-   * Draws a model on the toolkit's target. One thread at a time draws a model, each with its own resource.
+   * Draws a model on the toolkit's target; without a target, nothing.
    *
    * <p>A model is in the distance fog as a whole or not at all: when an end of its upright axis lies beyond where the fog
    * begins. Its light is that of its mesh as it was built: the matrix does not turn the sun's effect along.
    *
-   * @param model the model
+   * @param model the model, whose pool is open
    * @param matrix from the model to the world
+   * @throws IllegalStateException if the model or its pool is closed
    */
   void draw(Model model, Matrix matrix);
 
@@ -30,6 +36,7 @@ public interface ThreadResource extends AutoCloseable {
    * @param model the model
    * @param matrix from the model to the world, as for {@link #draw}
    * @return its place, or nothing when it is out of view
+   * @throws IllegalStateException if the model or its pool is closed
    */
   Optional<ScreenPlacement> drawPlaced(Model model, Matrix matrix);
 

@@ -97,19 +97,21 @@ public interface Toolkit extends Painter, Scene, AutoCloseable {
    * @param width columns, not negative
    * @param height rows, not negative
    * @return the sprite; its pixels are undefined until something writes them
+   * @throws IllegalArgumentException if a size is negative, or both together are too large
    */
   Sprite createSprite(int width, int height);
 
   /**
    * Makes a sprite from pixels.
    *
-   * @param pixels 0xAARRGGBB words, row after row
+   * @param pixels 0xAARRGGBB words, row after row; they are copied
    * @param width columns
    * @param height rows
    * @param stride words from one row to the next
    * @param opaque true to make every word but 0 opaque, false to take alpha as it is
    * @return the sprite
    * @throws ArrayIndexOutOfBoundsException if the array is too short
+   * @throws IllegalArgumentException if a size is negative
    */
   Sprite createSprite(int[] pixels, int width, int height, int stride, boolean opaque);
 
@@ -127,7 +129,7 @@ public interface Toolkit extends Painter, Scene, AutoCloseable {
   }
 
   /**
-   * Makes a sprite from bytes that stand for colours of a palette.
+   * Makes a sprite from bytes that stand for colours of a palette. The arrays are copied.
    *
    * @param palette the colours; their alpha does not count
    * @param indices one byte a pixel, 0 to 255 unsigned, row after row
@@ -157,6 +159,7 @@ public interface Toolkit extends Painter, Scene, AutoCloseable {
    * @param width columns, not negative
    * @param height rows, not negative
    * @return the depth buffer
+   * @throws IllegalArgumentException if a size is negative, or both together are too large
    */
   DepthBuffer createDepthBuffer(int width, int height);
 
