@@ -72,38 +72,6 @@ class PeersTest extends ToolkitTest {
   }
 
   @Test
-  void withoutAFrame() {
-    toolkit.drawToNothing();
-    fa none = new fa(peer);
-    refuses(Exception.class, "No colour buffer", () -> peer.E(0, 0, 1, 1), () -> none.K(0, 0, 0, 1, 1, true));
-    assertEquals(0, none.nativeid);
-  }
-
-  @Test
-  void destroyingTwiceOnlyClearsTheField() {
-    wa mask = (wa) toolkit.createMask(pool, Spans.ellipse(3, 3));
-    oa depth = (oa) toolkit.createDepthBuffer(1, 1);
-    for (int i = 0; i < 2; i++) {
-      mask.ma();
-      pool.ma();
-      depth.za(depth.nativeid);
-      assertEquals(0, mask.nativeid | pool.nativeid | depth.nativeid);
-    }
-    refuses(NullPointerException.class, "", () -> peer.DA(0, mask, 0, 0));
-  }
-
-  @Test
-  void callsWithoutEffect() {
-    peer.N();
-    peer.da();
-    peer.RA(true);
-    peer.b(1, 1, 1, -1, 9);
-    toolkit.advance(5);
-    pool.u();
-    assertEquals(0, peer.j() + toolkit.takeModelCount());
-  }
-
-  @Test
   void errorsReachTheRuntime() throws Exception {
     MemoryPool empty = toolkit.createPool(0);
     var error = assertThrows(OutOfMemoryError.class, () -> toolkit.createMask(empty, Spans.ellipse(30, 30)));

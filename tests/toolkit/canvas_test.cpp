@@ -221,11 +221,10 @@ class canvas_test : public toolkit_fixture {
     return std::make_unique<canvas>(kit().vm, component, w, h, fake_desktop::binding());
   }
   // A canvas without shared memory forgets its pixels when it goes; the test gives them back.
-  void drop_plain(std::unique_ptr<canvas> c) {
-    EXPECT_FALSE(c->use_shm);
-    unsigned int* const pixels = c->colourbuffer;
+  void drop(std::unique_ptr<canvas> c) {
+    unsigned int* const pixels = c->use_shm ? nullptr : c->colourbuffer;
     c.reset();
-    pixels[w * h - 1] = 1;
+    if (pixels != nullptr) pixels[w * h - 1] = 1;
     _aligned_free(pixels);
     desktop.expect_nothing_held();
   }
@@ -237,67 +236,19 @@ class canvas_test : public toolkit_fixture {
   void expect_calls(const strings& expected) { EXPECT_EQ(std::exchange(desktop.log, {}), expected); }
 };
 
-const strings open_surface{"GetAWT 4", "Lock", "GetDrawingSurface", "ds.Lock", "GetInfo"};
+const strings open_surface{"GetAWT 4", "Lock", "GetDrawingSurface", "ds.Lock", "GetInfo", "XQueryExtension MIT-SHM"};
 const strings close_surface{"FreeInfo", "ds.Unlock", "FreeDrawingSurface", "Unlock"};
 const strings open_flip{"GetAWT 3", "GetDrawingSurface", "ds.Lock", "GetInfo"};
 const strings close_flip{"FreeInfo", "ds.Unlock", "FreeDrawingSurface"};
 
-TEST_F(canvas_test, shared_images_come_and_go_in_order) {
+TEST_F(canvas_test, shared_images_take_turns_and_take_the_targets_along) {
   const strings one{"XShmCreateImage 24,2,30,20", "shmget 2400,1023", "shmat", "XShmAttach"};
   std::unique_ptr<canvas> c = make();
-  expect_calls(open_surface + strings{"XQueryExtension MIT-SHM", "XShmQueryVersion"} + one + one +
-               strings{"XSync", "remove", "remove"} + close_surface);  // a killed process leaves no segment
-  EXPECT_EQ(static_cast<void*>(c->colourbuffer), c->shm[0].shmaddr);
-  EXPECT_EQ(reinterpret_cast<std::uintptr_t>(c->depthbuffer) % 64, 0u);
-  c.reset();
-  const strings gone{"XShmDetach", "destroy image", "shmdt"};
-  expect_calls((strings{"GetAWT 4", "Lock"}) + gone + gone + strings{"XFlush", "Unlock"});
-  desktop.expect_nothing_held();
-}
-
-TEST_F(canvas_test, without_shared_memory_there_is_one_plain_image_whose_pixels_outlive_it) {
-  const strings ask{"XQueryExtension MIT-SHM"}, ask_more{"XQueryExtension MIT-SHM", "XShmQueryVersion"};
-  for (const auto& [call, asked] : {std::pair("XQueryExtension0", ask), std::pair("XShmQueryVersion0", ask_more)}) {
-    failing({call});
-    std::unique_ptr<canvas> c = make();
-    expect_calls(open_surface + asked + strings{"XCreateImage 24,2,0,30,20,32,0"} + close_surface);
-    drop_plain(std::move(c));
-    expect_calls({"GetAWT 4", "Lock", "XFree", "Unlock"});
-  }
-  // Shared memory that does not work leaves nothing behind.
-  for (const std::string call : {"XShmCreateImage", "shmget", "shmat", "XShmAttach", "refused"}) {
-    for (const char* which : {"0", "1"}) {
-      SCOPED_TRACE(call + which);
-      failing({call + which});
-      desktop.others_errors = 1;
-      desktop.server_refuses_memory = call == "refused";
-      std::unique_ptr<canvas> c = make();
-      EXPECT_EQ(desktop.held, std::multiset<std::string>{"image"});
-      EXPECT_EQ(desktop.others_errors, 0) << "an error of someone else was swallowed";
-      drop_plain(std::move(c));
-    }
-  }
-}
-
-TEST_F(canvas_test, a_component_without_a_surface_or_memory_raises_and_leaves_nothing) {
-  const int weak = java.weak_references();
-  for (const char* call : {"GetAWT0", "GetDrawingSurface0", "ds.Lock0", "GetInfo0", "XCreateImage0", "1", "2"}) {
-    SCOPED_TRACE(call);
-    failing({call, "XQueryExtension0"});
-    const int buffer = std::atoi(call);
-    allocation_failure::fail_memalign(buffer, ENOMEM);
-    const std::string failure = failure_of([&] { make(); });
-    EXPECT_EQ(failure.rfind(buffer != 0 ? no_memory : "java.lang.IllegalStateException: component: ", 0), 0u)
-        << failure;
-    EXPECT_EQ(java.weak_references(), weak);
-    desktop.expect_nothing_held();
-  }
-}
-
-TEST_F(canvas_test, flips_of_shared_images_take_turns_and_take_the_targets_along) {
-  std::unique_ptr<canvas> c = make();
+  expect_calls(open_surface + strings{"XShmQueryVersion"} + one + one + strings{"XSync", "remove", "remove"} +
+               close_surface);  // removed from the start: a killed process leaves no segment
   unsigned int* const first = c->colourbuffer;
-  failing({});
+  EXPECT_EQ(static_cast<void*>(first), c->shm[0].shmaddr);
+  EXPECT_EQ(reinterpret_cast<std::uintptr_t>(c->depthbuffer) % 64, 0u);
   c->flip(5, 6, 20, 10);
   expect_calls(open_flip + strings{"XShmPutImage 7,5,6,0,0,20,10,0", "XFlush"} + close_flip);
   EXPECT_EQ(static_cast<void*>(c->colourbuffer), c->shm[1].shmaddr);
@@ -308,35 +259,65 @@ TEST_F(canvas_test, flips_of_shared_images_take_turns_and_take_the_targets_along
   c->flip_dirtyrect(0, 0, w, h, 1, 2);
   expect_calls(open_flip + close_flip);
   EXPECT_EQ(c->colourbuffer, first);
+  c.reset();
+  const strings gone{"XShmDetach", "destroy image", "shmdt"};
+  expect_calls((strings{"GetAWT 4", "Lock"}) + gone + gone + strings{"XFlush", "Unlock"});
+  desktop.expect_nothing_held();
 }
 
-TEST_F(canvas_test, a_plain_flip_leaves_the_targets) {
+TEST_F(canvas_test, without_shared_memory_there_is_one_plain_image_whose_pixels_outlive_it) {
   failing({"XQueryExtension0"});
   std::unique_ptr<canvas> c = make();
+  expect_calls(open_surface + strings{"XCreateImage 24,2,0,30,20,32,0"} + close_surface);
   unsigned int* const first = c->colourbuffer;
-  failing({});
   c->flip(5, 6, 20, 10);
   expect_calls(open_flip + strings{"XPutImage 7,5,6,0,0,20,10", "XFlush"} + close_flip);
   EXPECT_TRUE(c->colourbuffer == first && kit().colourbuffer == nullptr && Rasterizer_n::m_pColourBuffer == nullptr);
-  drop_plain(std::move(c));
+  drop(std::move(c));
+  expect_calls({"GetAWT 4", "Lock", "XFree", "Unlock"});
 }
 
-TEST_F(canvas_test, flips_without_a_surface_return_quietly) {
-  std::unique_ptr<canvas> c = make();
-  unsigned int* const first = c->colourbuffer;
-  const std::pair<const char*, strings> cases[] = {
-      {"GetAWT0", {"GetAWT 3"}},
-      {"GetDrawingSurface0", {"GetAWT 3", "GetDrawingSurface"}},
-      {"ds.Lock0", {"GetAWT 3", "GetDrawingSurface", "ds.Lock", "FreeDrawingSurface"}},
-      {"GetInfo0", {"GetAWT 3", "GetDrawingSurface", "ds.Lock", "GetInfo", "ds.Unlock", "FreeDrawingSurface"}}};
-  for (const auto& [call, expected] : cases) {
-    for (const bool dirty : {false, true}) {
-      failing({call});
-      dirty ? c->flip_dirtyrect(0, 0, 1, 1, 1, 1) : c->flip(0, 0, w, h);
-      expect_calls(expected);
-      EXPECT_EQ(c->colourbuffer, first);
+// Whatever fails in a canvas's life: it is not made, or works with plain images, or shows nothing; nothing is left
+// over.
+TEST_F(canvas_test, every_failure_half_way_gives_everything_back) {
+  const int weak = java.weak_references();
+  int refused = 0, plain = 0;
+  for (const std::string call :
+       {"GetAWT", "GetDrawingSurface", "ds.Lock", "GetInfo", "XCreateImage", "XShmQueryVersion", "XShmCreateImage",
+        "shmget", "shmat", "XShmAttach", "memory", "refused"}) {
+    for (const char* count : {"0", "1", "2"}) {
+      SCOPED_TRACE(call + count);
+      failing({call + count, call == "XCreateImage" || call == "memory" ? "XQueryExtension0" : ""});
+      if (call == "memory") allocation_failure::fail_memalign(std::atoi(count) + 1, ENOMEM);
+      desktop.others_errors = 1;
+      desktop.server_refuses_memory = call == "refused";
+      std::unique_ptr<canvas> c;
+      const std::string failure = failure_of([&] { c = make(); });
+      allocation_failure::none();
+      if (c == nullptr) {
+        const std::string why = call == "memory" ? no_memory : "java.lang.IllegalStateException: component: ";
+        EXPECT_EQ(failure.rfind(why, 0), 0u) << failure;
+        ++refused;
+      } else {
+        EXPECT_EQ(desktop.others_errors, desktop.counts["XSync"] == 0 ? 1 : 0) << "someone else's error was swallowed";
+        const unsigned int* const first = c->colourbuffer;
+        c->flip(0, 0, w, h);
+        EXPECT_EQ(c->colourbuffer != first, desktop.counts["XShmPutImage"] == 1);
+        plain += c->use_shm ? 0 : 1;
+        c->flip_dirtyrect(0, 0, 1, 1, 1, 1);
+        drop(std::move(c));
+      }
+      desktop.expect_nothing_held();
+      EXPECT_EQ(java.weak_references(), weak);
     }
   }
+  EXPECT_EQ(refused, 7) << "without AWT, a surface and its lock and info, an image, and both buffers";
+  EXPECT_EQ(plain, 15);
+}
+
+TEST_F(canvas_test, a_component_that_was_collected_shows_nothing) {
+  std::unique_ptr<canvas> c = make();
+  failing({});
   java.collect(component);
   c->flip(0, 0, w, h);
   expect_calls({"GetAWT 3"});
@@ -362,7 +343,8 @@ TEST_F(canvas_test, resizing_replaces_everything_even_when_it_fails) {
   EXPECT_TRUE(c->width == w && c->use_shm);
   failing({"XQueryExtension0"});
   c->resized(component, w, h);
-  drop_plain(std::move(c));
+  EXPECT_FALSE(c->use_shm);
+  drop(std::move(c));
   EXPECT_EQ(java.weak_references(), weak - 1);
 }
 

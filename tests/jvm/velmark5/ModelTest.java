@@ -4,10 +4,10 @@ import static org.junit.jupiter.api.Assertions.*;
 
 import java.util.ArrayList;
 import java.util.Arrays;
-import java.util.Collections;
 import java.util.EnumSet;
 import java.util.List;
 import java.util.Set;
+import java.util.concurrent.CompletableFuture;
 import org.junit.jupiter.api.BeforeEach;
 import org.junit.jupiter.api.Test;
 
@@ -280,30 +280,23 @@ class ModelTest extends ToolkitTest {
 
   /** Workers draw models of their own into parts of one target that do not touch. */
   @Test
-  void workersDrawSideBySide() throws Exception {
-    List<Thread> workers = new ArrayList<>();
-    List<Throwable> failures = Collections.synchronizedList(new ArrayList<>());
+  void workersDrawSideBySide() {
     int blue = drawn(square(BLUE), HERE);
     toolkit.clearAll(0);
+    List<CompletableFuture<Void>> workers = new ArrayList<>();
     for (int i = 0; i < 4; i++) {
       Model model = square(BLUE);
       ThreadResource own = toolkit.createThreadResource();
       Matrix place = Matrix.scaling(0.4, 0.4, 1).then(Matrix.translation(i % 2 == 0 ? -50 : 50, i < 2 ? -50 : 50, 0));
-      Thread worker = new Thread(() -> {
+      workers.add(CompletableFuture.runAsync(() -> {
         own.begin();
         for (int k = 0; k < 200; k++) {
           own.draw(model, place);
         }
         own.end();
-      });
-      worker.setUncaughtExceptionHandler((thread, e) -> failures.add(e));
-      workers.add(worker);
+      }, task -> new Thread(task).start()));
     }
-    workers.forEach(Thread::start);
-    for (Thread worker : workers) {
-      worker.join();
-    }
-    assertEquals(List.of(), failures);
+    workers.forEach(CompletableFuture::join);
     assertArrayEquals(new int[] {blue, blue, blue, blue, 0},
         new int[] {at(16, 16), at(48, 16), at(16, 48), at(48, 48), middle()});
   }
