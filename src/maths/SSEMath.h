@@ -273,9 +273,10 @@ VELMARK5_LANE Int4 narrow(Channels a) { return narrow(a.low, a.high); }
 
 // --- Prefetch -------------------------------------------------------------------------------------------------------
 
-// The line at p into the outer caches, and one level nearer.
+// The line at p into the outer caches, one level nearer, and all the way.
 VELMARK5_LANE void prefetch_outer(const void* p) { _mm_prefetch(static_cast<const char*>(p), _MM_HINT_T2); }
 VELMARK5_LANE void prefetch_nearer(const void* p) { _mm_prefetch(static_cast<const char*>(p), _MM_HINT_T1); }
+VELMARK5_LANE void prefetch_nearest(const void* p) { _mm_prefetch(static_cast<const char*>(p), _MM_HINT_T0); }
 
 // --- Streaming stores -----------------------------------------------------------------------------------------------
 

@@ -109,10 +109,9 @@ VELMARK5_LANE void fill_group(const HorizontalLine_s& line, const HalfTriangle_s
   if constexpr (Modes.depth_test) {
     const Int4 passes = less_equal(line.z.value, load(line.depth_row + x));
     mask = Masked ? mask & passes : passes;
-    // A group inside the span that fails costs no more. The groups at its ends go on with an empty mask: small
-    // triangles consist of them, and a branch that waits for the depth and cannot be foreseen costs more than the
-    // pixels.
-    if constexpr (!Masked) {
+    // A group that fails costs no more. Only the groups at the ends of plain spans go on with an empty mask: they are
+    // cheaper than a branch that waits for the depth and that nobody can foresee.
+    if constexpr (!Masked || Modes.textured()) {
       if (lane_bits(mask) == 0) return;
     }
   }

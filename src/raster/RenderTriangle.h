@@ -55,6 +55,17 @@ VELMARK5_LANE bool edges_meet(SSEMath::Float4 edge) {
   return (SSEMath::lane_bits(SSEMath::equal(edge, SSEMath::shuffle<2, 3, 0, 1>(edge))) & 1) != 0;
 }
 
+// Brings the first rows below a pixel of a target into the cache, while the setup goes on. The pixel may lie anywhere:
+// addresses are integers here.
+VELMARK5_LANE void prefetch_rows(const void* target, int x, int y) {
+  const std::ptrdiff_t row_bytes = std::ptrdiff_t{m_ScreenPitch} * 4;
+  auto address = reinterpret_cast<std::uintptr_t>(target) + static_cast<std::uintptr_t>(y * row_bytes) +
+                 4 * static_cast<std::uintptr_t>(std::ptrdiff_t{x});
+  for (int i = 0; i < 4; ++i, address += static_cast<std::uintptr_t>(row_bytes)) {
+    SSEMath::prefetch_nearest(reinterpret_cast<const void*>(address));
+  }
+}
+
 template <ShadeMode_e Shade, TexAddressMode_e AddressU, TexAddressMode_e AddressV, bool TransformTexCoords,
           FogMode_e Fog, BlendMode_e Blend, bool ColourKey, bool LightMap, bool DepthWrite, bool ColourWrite,
           bool DepthTest>
@@ -95,6 +106,12 @@ void RenderTriangle(const Triangle_s& triangle) {
   const int wanted_lower = wrapping_add(wrapping_subtract(row_b, row_m), missed);
   const int rows_lower = start_lower < clip_bottom ? std::min(clip_bottom - start_lower, wanted_lower) : 0;
   if (!has_upper && rows_lower <= 0) return;
+
+  if constexpr (Shade != ShadeMode_e::Mask) {
+    const int column = lane<0>(truncate(vertex_t));
+    if constexpr (DepthTest) prefetch_rows(m_pDepthBuffer, column, start);
+    if constexpr (ColourWrite) prefetch_rows(m_pColourBuffer, column, start);
+  }
 
   HalfTriangle_s half;
   half.y = start;
