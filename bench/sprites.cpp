@@ -5,8 +5,10 @@
 #include <benchmark/benchmark.h>
 #include <pixman.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstdint>
+#include <string>
 #include <vector>
 
 #include "bench_toolkit.h"
@@ -29,12 +31,12 @@ struct place {
   int x, y;
 };
 
-// Boxes of w by h all over the target.
-std::vector<place> places(int w, int h) {
+// Squares of `side` all over the target.
+std::vector<place> places(int side) {
   test_random random(1);
   std::vector<place> list;
   for (int i = 0; i < 64; ++i)
-    list.push_back({random.between(0, target_width - w), random.between(0, target_height - h)});
+    list.push_back({random.between(0, target_width - side), random.between(0, target_height - side)});
   return list;
 }
 
@@ -55,12 +57,28 @@ void paint(Sprite_c& sprite, int size, look kind) {
   }
 }
 
-// A frame and an image, for the library and as pixman sees them.
+// What is drawn: a square image, the side of the square it is drawn in, and the pixels that it covers there.
+struct work {
+  std::string name;
+  int size;
+  look kind;
+  BlendMode_e blend;
+  int side;
+  int pixels;
+};
+
+// A frame and the image, for the library and as pixman sees them.
 struct bench_scene {
-  bench_scene(int size, look kind, pixman_format_code_t format) : frame(target_width, target_height) {
-    paint(sprite, size, kind);
-    to = pixman_image_create_bits_no_clear(format, target_width, target_height, frame.colour, target_width * 4);
-    from = pixman_image_create_bits_no_clear(PIXMAN_a8r8g8b8, size, size, sprite.pixels, size * 4);
+  explicit bench_scene(const work& w)
+      : frame(target_width, target_height),
+        op(w.blend == BlendMode_e::replace ? PIXMAN_OP_SRC
+           : w.blend == BlendMode_e::alpha ? PIXMAN_OP_OVER
+                                           : PIXMAN_OP_ADD) {
+    paint(sprite, w.size, w.kind);
+    // The format in which pixman is fastest.
+    to = pixman_image_create_bits_no_clear(op == PIXMAN_OP_ADD ? PIXMAN_a8r8g8b8 : PIXMAN_x8r8g8b8, target_width,
+                                           target_height, frame.colour, target_width * 4);
+    from = pixman_image_create_bits_no_clear(PIXMAN_a8r8g8b8, w.size, w.size, sprite.pixels, w.size * 4);
     target = sprite_target(frame.kit());
   }
   ~bench_scene() {
@@ -68,236 +86,134 @@ struct bench_scene {
     pixman_image_unref(to);
   }
   bench_scene(const bench_scene&) = delete;
+  bench_scene& operator=(const bench_scene&) = delete;
 
   bench_toolkit frame;
+  pixman_op_t op;
   Sprite_c sprite;
   SpriteTarget_s target;
   pixman_image_t* to;
   pixman_image_t* from;
 };
 
-// The format in which pixman is fastest.
-constexpr pixman_format_code_t best_format(pixman_op_t op) {
-  return op == PIXMAN_OP_ADD ? PIXMAN_a8r8g8b8 : PIXMAN_x8r8g8b8;
+// Measures what make(scene) gives: a function that draws at a place.
+template <class Make>
+void add(const work& w, const std::string& who, Make make) {
+  const std::string name = "sprites/" + w.name + "/" + who + "/" + std::to_string(w.size);
+  benchmark::RegisterBenchmark(name.c_str(), [=](benchmark::State& state) {
+    bench_scene scene(w);
+    const auto draw = make(scene);
+    const auto list = places(w.side);
+    for (auto _ : state) {
+      for (const place& at : list) draw(at);
+      benchmark::ClobberMemory();
+    }
+    report(state, 64.0 * w.pixels);
+  });
 }
 
-pixman_op_t operator_of(BlendMode_e blend) {
-  return blend == BlendMode_e::replace ? PIXMAN_OP_SRC : blend == BlendMode_e::alpha ? PIXMAN_OP_OVER : PIXMAN_OP_ADD;
-}
-
-// --- As it stands ---------------------------------------------------------------------------------------------------
-
-template <BlendMode_e Blend, look Kind>
-void plain(benchmark::State& state) {
-  const int size = static_cast<int>(state.range(0));
-  bench_scene scene(size, Kind, PIXMAN_a8r8g8b8);
-  const auto render = sprite_select::render<VELMARK5_PLAIN>(none, static_cast<int>(Blend));
-  const auto list = places(size, size);
-  RenderParams_s params;
-  for (auto _ : state) {
-    for (const auto& at : list) {
+// One of the library's placements that take a rectangle.
+void add_ours(const work& w, sprite_select::Render render) {
+  add(w, "velmark5", [=](bench_scene& scene) {
+    // For those that test depths: every other row passes.
+    for (int i = 0; i < target_width * target_height; ++i) scene.frame.depth[i] = i / target_width % 2 == 0 ? 10 : 1;
+    scene.target.depth = scene.frame.depth;
+    return [=, &scene](place at) {
+      RenderParams_s params;
       params.x = at.x;
       params.y = at.y;
+      params.z = 5;
+      params.width = params.height = w.side;
       (scene.sprite.*render)(params, scene.target);
-    }
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * size * size);
+    };
+  });
 }
 
-template <BlendMode_e Blend, look Kind>
-void pixman_plain(benchmark::State& state) {
-  const int size = static_cast<int>(state.range(0));
-  const pixman_op_t op = operator_of(Blend);
-  bench_scene scene(size, Kind, best_format(op));
-  const auto list = places(size, size);
-  for (auto _ : state) {
-    for (const auto& at : list)
-      pixman_image_composite32(op, scene.from, nullptr, scene.to, 0, 0, 0, 0, at.x, at.y, size, size);
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * size * size);
+// pixman over the whole square, from the image as prepare(image) leaves it.
+template <class Prepare>
+void add_pixman(const work& w, Prepare prepare) {
+  add(w, "pixman", [=](bench_scene& scene) {
+    prepare(scene.from);
+    return [=, &scene](place at) {
+      pixman_image_composite32(scene.op, scene.from, nullptr, scene.to, 0, 0, 0, 0, at.x, at.y, w.side, w.side);
+    };
+  });
 }
 
-#define PLAIN(blend, kind)                                                                                           \
-  BENCHMARK(plain<BlendMode_e::blend, look::kind>)->Name("sprites/" #blend "/" #kind "/velmark5")->Arg(16)->Arg(64); \
-  BENCHMARK(pixman_plain<BlendMode_e::blend, look::kind>)                                                            \
-      ->Name("sprites/" #blend "/" #kind "/pixman")                                                                  \
-      ->Arg(16)                                                                                                      \
-      ->Arg(64);
-PLAIN(replace, soft)
-PLAIN(alpha, soft)
-PLAIN(alpha, disc)
-PLAIN(additive, soft)
-
-// --- Scaled: 64x64 to 100x100, nearest
-// --------------------------------------------------------------------------------
-
-constexpr int scaled_size = 100;
-
-template <BlendMode_e Blend>
-void scaled(benchmark::State& state) {
-  bench_scene scene(64, look::soft, PIXMAN_a8r8g8b8);
-  const auto render = sprite_select::render<VELMARK5_SCALED>(none, static_cast<int>(Blend));
-  const auto list = places(scaled_size, scaled_size);
-  RenderParams_s params;
-  params.width = params.height = scaled_size;
-  for (auto _ : state) {
-    for (const auto& at : list) {
-      params.x = at.x;
-      params.y = at.y;
-      (scene.sprite.*render)(params, scene.target);
-    }
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * scaled_size * scaled_size);
-}
-
-// The same with a depth test that half of the rows pass. pixman has no equal.
-void scaled_tested(benchmark::State& state) {
-  bench_scene scene(64, look::soft, PIXMAN_a8r8g8b8);
-  for (int i = 0; i < target_width * target_height; ++i)
-    scene.frame.depth[i] = i / target_width % 2 == 0 ? 10.0f : 1.0f;
-  scene.target.depth = scene.frame.depth;
-  const auto render = sprite_select::render<VELMARK5_SCALED_TESTED>(none, static_cast<int>(BlendMode_e::alpha));
-  const auto list = places(scaled_size, scaled_size);
-  RenderParams_s params;
-  params.z = 5;
-  params.width = params.height = scaled_size;
-  for (auto _ : state) {
-    for (const auto& at : list) {
-      params.x = at.x;
-      params.y = at.y;
-      (scene.sprite.*render)(params, scene.target);
-    }
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * scaled_size * scaled_size);
-}
-
-template <BlendMode_e Blend>
-void pixman_scaled(benchmark::State& state) {
-  const pixman_op_t op = operator_of(Blend);
-  bench_scene scene(64, look::soft, best_format(op));
-  pixman_transform_t transform;
-  pixman_transform_init_scale(&transform, pixman_double_to_fixed(0.64), pixman_double_to_fixed(0.64));
-  pixman_image_set_transform(scene.from, &transform);
-  pixman_image_set_filter(scene.from, PIXMAN_FILTER_NEAREST, nullptr, 0);
-  const auto list = places(scaled_size, scaled_size);
-  for (auto _ : state) {
-    for (const auto& at : list) {
-      pixman_image_composite32(op, scene.from, nullptr, scene.to, 0, 0, 0, 0, at.x, at.y, scaled_size, scaled_size);
-    }
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * scaled_size * scaled_size);
-}
-
-#define SCALED(blend)                                                                     \
-  BENCHMARK(scaled<BlendMode_e::blend>)->Name("sprites/scaled_" #blend "/soft/velmark5"); \
-  BENCHMARK(pixman_scaled<BlendMode_e::blend>)->Name("sprites/scaled_" #blend "/soft/pixman");
-SCALED(replace)
-SCALED(alpha)
-SCALED(additive)
-BENCHMARK(scaled_tested)->Name("sprites/scaled_tested/soft/velmark5");
-
-// --- Rotated by 30 degrees, nearest
-// -----------------------------------------------------------------------------------
-
-template <BlendMode_e Blend>
-void rotated(benchmark::State& state) {
-  const int size = static_cast<int>(state.range(0));
-  bench_scene scene(size, look::soft, PIXMAN_a8r8g8b8);
-  const auto render = sprite_select::parallelogram(none, static_cast<int>(Blend));
-  const double c = std::cos(M_PI / 6) * size, s = std::sin(M_PI / 6) * size;
-  const int box = static_cast<int>(std::ceil(c + s));
-  const auto list = places(box, box);
-  for (auto _ : state) {
-    for (const auto& at : list) {
-      ParallelogramRenderParams params{};
-      params.x0 = static_cast<float>(at.x + s);
-      params.y0 = static_cast<float>(at.y);
-      params.x1 = static_cast<float>(params.x0 + c);
-      params.y1 = static_cast<float>(params.y0 + s);
-      params.x2 = static_cast<float>(params.x0 - s);
-      params.y2 = static_cast<float>(params.y0 + c);
-      (scene.sprite.*render)(params, scene.target);
-    }
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * size * size);
-}
-
-// pixman walks the bounding box; what lies outside the image is clear.
-template <BlendMode_e Blend>
-void pixman_rotated(benchmark::State& state) {
-  const int size = static_cast<int>(state.range(0));
-  const pixman_op_t op = operator_of(Blend);
-  bench_scene scene(size, look::soft, best_format(op));
-  const double c = std::cos(M_PI / 6), s = std::sin(M_PI / 6);
-  const int box = static_cast<int>(std::ceil((c + s) * size));
-  const pixman_f_transform_t map = {{{c, s, -s * size * c}, {-s, c, s * size * s}, {0, 0, 1}}};
+void use_transform(pixman_image_t* image, const pixman_f_transform_t& map) {
   pixman_transform_t transform;
   pixman_transform_from_pixman_f_transform(&transform, &map);
-  pixman_image_set_transform(scene.from, &transform);
-  pixman_image_set_filter(scene.from, PIXMAN_FILTER_NEAREST, nullptr, 0);
-  const auto list = places(box, box);
-  for (auto _ : state) {
-    for (const auto& at : list)
-      pixman_image_composite32(op, scene.from, nullptr, scene.to, 0, 0, 0, 0, at.x, at.y, box, box);
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * size * size);
+  pixman_image_set_transform(image, &transform);
+  pixman_image_set_filter(image, PIXMAN_FILTER_NEAREST, nullptr, 0);
 }
 
-#define ROTATED(blend)                                                                                        \
-  BENCHMARK(rotated<BlendMode_e::blend>)->Name("sprites/rotated_" #blend "/soft/velmark5")->Arg(16)->Arg(64); \
-  BENCHMARK(pixman_rotated<BlendMode_e::blend>)->Name("sprites/rotated_" #blend "/soft/pixman")->Arg(16)->Arg(64);
-ROTATED(alpha)
-ROTATED(additive)
+void add_plain(const std::string& name, int size, look kind, BlendMode_e blend) {
+  const work w{name, size, kind, blend, size, size * size};
+  add_ours(w, sprite_select::render<VELMARK5_PLAIN>(none, static_cast<int>(blend)));
+  add_pixman(w, [](pixman_image_t*) {});
+}
 
-// --- Tiled over 256x256
-// -----------------------------------------------------------------------------------------------
+void add_scaled(const std::string& name, BlendMode_e blend) {
+  constexpr int from = 64, to = 100;
+  const work w{name, from, look::soft, blend, to, to * to};
+  add_ours(w, sprite_select::render<VELMARK5_SCALED>(none, static_cast<int>(blend)));
+  constexpr double step = static_cast<double>(from) / to;
+  add_pixman(w, [](pixman_image_t* image) { use_transform(image, {{{step, 0, 0}, {0, step, 0}, {0, 0, 1}}}); });
+}
 
-constexpr int tiled_size = 256;
+// The scaled image behind a depth test that half of the rows pass. pixman has no equal.
+void add_tested() {
+  const work w{"scaled_tested/soft", 64, look::soft, BlendMode_e::alpha, 100, 100 * 100};
+  add_ours(w, sprite_select::render<VELMARK5_SCALED_TESTED>(none, static_cast<int>(w.blend)));
+}
 
-template <BlendMode_e Blend>
-void tiled(benchmark::State& state) {
-  bench_scene scene(static_cast<int>(state.range(0)), look::soft, PIXMAN_a8r8g8b8);
-  const auto render = sprite_select::tiled(none, static_cast<int>(Blend));
-  const auto list = places(tiled_size, tiled_size);
-  RenderParams_s params;
-  params.width = params.height = tiled_size;
-  for (auto _ : state) {
-    for (const auto& at : list) {
-      params.x = at.x;
-      params.y = at.y;
+// By 30 degrees. pixman walks the bounding box; what lies outside the image is clear.
+void add_rotated(const std::string& name, int size, BlendMode_e blend) {
+  const double c = std::cos(M_PI / 6), s = std::sin(M_PI / 6);
+  const int box = static_cast<int>(std::ceil((c + s) * size));
+  const work w{name, size, look::soft, blend, box, size * size};
+  const auto render = sprite_select::parallelogram(none, static_cast<int>(blend));
+  add(w, "velmark5", [=](bench_scene& scene) {
+    return [=, &scene](place at) {
+      ParallelogramRenderParams params{};
+      params.x0 = static_cast<float>(at.x + s * size);
+      params.y0 = static_cast<float>(at.y);
+      params.x1 = static_cast<float>(params.x0 + c * size);
+      params.y1 = static_cast<float>(params.y0 + s * size);
+      params.x2 = static_cast<float>(params.x0 - s * size);
+      params.y2 = static_cast<float>(params.y0 + c * size);
       (scene.sprite.*render)(params, scene.target);
-    }
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * tiled_size * tiled_size);
+    };
+  });
+  add_pixman(w, [=](pixman_image_t* image) {
+    use_transform(image, {{{c, s, -s * size * c}, {-s, c, s * size * s}, {0, 0, 1}}});
+  });
 }
 
-template <BlendMode_e Blend>
-void pixman_tiled(benchmark::State& state) {
-  const pixman_op_t op = operator_of(Blend);
-  bench_scene scene(static_cast<int>(state.range(0)), look::soft, best_format(op));
-  pixman_image_set_repeat(scene.from, PIXMAN_REPEAT_NORMAL);
-  const auto list = places(tiled_size, tiled_size);
-  for (auto _ : state) {
-    for (const auto& at : list) {
-      pixman_image_composite32(op, scene.from, nullptr, scene.to, 0, 0, 0, 0, at.x, at.y, tiled_size, tiled_size);
-    }
-    benchmark::ClobberMemory();
-  }
-  report(state, 64.0 * tiled_size * tiled_size);
+void add_tiled(const std::string& name, int size, BlendMode_e blend) {
+  constexpr int side = 256;
+  const work w{name, size, look::soft, blend, side, side * side};
+  add_ours(w, sprite_select::tiled(none, static_cast<int>(blend)));
+  add_pixman(w, [](pixman_image_t* image) { pixman_image_set_repeat(image, PIXMAN_REPEAT_NORMAL); });
 }
 
-#define TILED(blend)                                                                                      \
-  BENCHMARK(tiled<BlendMode_e::blend>)->Name("sprites/tiled_" #blend "/soft/velmark5")->Arg(16)->Arg(64); \
-  BENCHMARK(pixman_tiled<BlendMode_e::blend>)->Name("sprites/tiled_" #blend "/soft/pixman")->Arg(16)->Arg(64);
-TILED(replace)
-TILED(alpha)
+const bool registered = [] {
+  using enum BlendMode_e;
+  for (const int size : {16, 64}) {
+    add_plain("replace/soft", size, look::soft, replace);
+    add_plain("alpha/soft", size, look::soft, alpha);
+    add_plain("alpha/disc", size, look::disc, alpha);
+    add_plain("additive/soft", size, look::soft, additive);
+    add_rotated("rotated_alpha/soft", size, alpha);
+    add_rotated("rotated_additive/soft", size, additive);
+    add_tiled("tiled_replace/soft", size, replace);
+    add_tiled("tiled_alpha/soft", size, alpha);
+  }
+  add_scaled("scaled_replace/soft", replace);
+  add_scaled("scaled_alpha/soft", alpha);
+  add_scaled("scaled_additive/soft", additive);
+  add_tested();
+  return true;
+}();
 
 }  // namespace
