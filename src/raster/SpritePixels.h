@@ -229,6 +229,19 @@ template <BlendMode_e Blend, int Rows = 1, class Source>
 VELMARK5_LANE void draw_run(std::uint32_t* to, int n, Source&& source, std::ptrdiff_t pitch = 0) {
   constexpr Blending<Blend> blend;
   int i = 0;
+  if constexpr (!blend.reads_target) {
+    for (; i + 16 <= n; i += 16) {
+      const Int4 a = blend.terms(source(i)), b = blend.terms(source(i + 4));
+      const Int4 c = blend.terms(source(i + 8)), d = blend.terms(source(i + 12));
+      for (int r = 0; r < Rows; ++r) {
+        std::uint32_t* const row = to + r * pitch + i;
+        store_unaligned(row, a);
+        store_unaligned(row + 4, b);
+        store_unaligned(row + 8, c);
+        store_unaligned(row + 12, d);
+      }
+    }
+  }
 #pragma GCC unroll 2
   for (; i + 4 <= n; i += 4) {
     const auto s = blend.terms(source(i));
