@@ -153,9 +153,7 @@ VELMARK5_LANE bool only_clear_or_full(Int4 s, Int4 t) {
   const Int4 one = splat(0x01000000u);
   return lane_bits(equal(((s + one) | (t + one)) & splat(0xFE000000u), splat(0u))) == 15;
 }
-VELMARK5_LANE Int4 blend_clear_or_full(Int4 s, Int4 d) {
-  return select(sign_mask(s), subtract_saturating_bytes(s, splat(0x01010101u)), d);
-}
+VELMARK5_LANE Int4 full_blended(Int4 s) { return subtract_saturating_bytes(s, splat(0x01010101u)); }
 
 // min(d + s, 255)
 template <>
@@ -267,11 +265,22 @@ VELMARK5_LANE void draw_image_run(std::uint32_t* to, int n, Source&& source) {
     for (; i + 8 <= n; i += 8) {
       const Int4 s = source(i);
       const Int4 t = source(i + 4);
+      if (only_clear_or_full(s, t)) {
+        const int full = lane_bits(s) + lane_bits(t);
+        if (full == 0) continue;
+        if (full == 30) {
+          store_unaligned(to + i, full_blended(s));
+          store_unaligned(to + i + 4, full_blended(t));
+        } else {
+          store_unaligned(to + i, select(sign_mask(s), full_blended(s), load_unaligned(to + i)));
+          store_unaligned(to + i + 4, select(sign_mask(t), full_blended(t), load_unaligned(to + i + 4)));
+        }
+        continue;
+      }
       const Int4 d = load_unaligned(to + i);
       const Int4 e = load_unaligned(to + i + 4);
-      const bool simple = only_clear_or_full(s, t);
-      store_unaligned(to + i, simple ? blend_clear_or_full(s, d) : blend(blend.terms(s), d));
-      store_unaligned(to + i + 4, simple ? blend_clear_or_full(t, e) : blend(blend.terms(t), e));
+      store_unaligned(to + i, blend(blend.terms(s), d));
+      store_unaligned(to + i + 4, blend(blend.terms(t), e));
     }
     for (; i + 4 <= n; i += 4) store_unaligned(to + i, blend(blend.terms(source(i)), load_unaligned(to + i)));
     for (; i < n; ++i) store_one(to + i, blend(blend.terms(source.one(i)), load_one(to + i)));
