@@ -24,10 +24,11 @@ class ModelRenderTest : public mesh_fixture {
   void random_state(test_random& r) {
     const auto colour_word = [&r] { return static_cast<jint>(r.word()); };
     Java_ja_GA(env, peer, 0, 1);
-    Java_ja_AA(env, peer, java.new_floats(placed(r.real(-0.1f, 0.1f), r.real(-0.1f, 0.1f), 1, r.real(-9, 9), 5, 0)));
+    const float turn = r.one_in(3) ? 0 : r.real(-0.1f, 0.1f), tilt = turn == 0 ? 0 : r.real(-0.1f, 0.1f);
+    Java_ja_AA(env, peer, java.new_floats(placed(turn, tilt, 1, r.real(-9, 9), 5, 0)));
     Java_ja_c(env, peer, colour_word(), r.one_in(3) ? 0 : r.between(1, 1700));
     perspective(50, 1500);
-    Java_ja_IA(env, peer, r.one_in(20) ? r.real(-1e6f, 1e6f) : r.real(0.3f, 1.3f));
+    Java_ja_IA(env, peer, r.one_in(30) ? NAN : r.one_in(20) ? r.real(-1e6f, 1e6f) : r.real(0.3f, 1.3f));
     Java_ja_m(env, peer, colour_word(), r.real(-0.5f, 1.5f), r.real(-0.5f, 1.5f), r.real(-1, 1), r.real(-1, 1), 0.2f);
     Java_ja_O(env, peer);
     if (r.one_in(2)) Java_ja_M(env, peer, r.between(-250, 250), colour_word(), r.between(60, 900), 0);
@@ -42,6 +43,8 @@ class ModelRenderTest : public mesh_fixture {
   }
 
   static Numbers random_place(test_random& r) {
+    // With vertices beside the eye and, with a level camera, at no distance at all.
+    if (r.one_in(8)) return placed(0, 0, 1, r.real(-300, 300), r.real(-220, 220), r.between(-100, 100));
     const float turn = r.real(0, 6.3f), tilt = r.one_in(3) ? r.real(-0.4f, 0.4f) : 0;
     return placed(turn, tilt, r.real(0.5f, 1.5f), r.real(-300, 300), r.real(-220, 220),
                   r.one_in(5) ? r.real(-300, 1900) : r.real(200, 700));

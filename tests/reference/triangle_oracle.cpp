@@ -13,11 +13,13 @@ namespace {
 
 // --- Numbers --------------------------------------------------------------------------------------------------------
 
-// Of rows and of pixels: wide enough for the difference of any two coordinates.
-using distance = std::int64_t;
-distance between(int from, int to) { return static_cast<distance>(to) - from; }
+// Of rows and of pixels. Those of absurd coordinates wrap.
+using distance = std::int32_t;
+distance between(int from, int to) {
+  return static_cast<distance>(static_cast<unsigned>(to) - static_cast<unsigned>(from));
+}
 
-std::uint16_t low_word(distance x) { return static_cast<std::uint16_t>(x); }
+std::uint16_t low_word(int x) { return static_cast<std::uint16_t>(x); }
 
 // Float to unsigned 16 bits; what is out of range saturates. The subtraction wraps, as the conversion's answer for
 // what is no integer shows.
@@ -266,15 +268,15 @@ void render_triangle(const TriangleModes& modes, const Triangle_s& t) {
   const bool left_is_long = top_middle.real[X] > top_bottom.real[X];
   Edge left(top, left_is_long ? top_bottom : top_middle, skip);
   Edge right(top, left_is_long ? top_middle : top_bottom, skip);
+  const int end_upper = std::min(y_middle, end);
   int y = first;
-  const distance upper = between(first, std::min(y_middle, end));
-  fill_rows(modes, t, y, upper, left, right);
+  if (first < end_upper) fill_rows(modes, t, y, between(first, end_upper), left, right);
 
   // The lower trapezoid: one edge is replaced, the other carries on. Rows that the clipping took from above both count
   // as skipped.
-  const distance skip_lower = std::max<distance>(-upper, 0);
-  const distance lower = std::min(between(y, end), between(y_middle, y_bottom) - skip_lower);
-  if (lower <= 0) return;
+  const distance skip_lower = first < end_upper ? 0 : between(end_upper, first);
+  const distance lower = std::min(between(y, end), between(skip_lower, between(y_middle, y_bottom)));
+  if (y >= end || lower <= 0) return;
   (top_bottom.real[X] > middle_bottom.real[X] ? right : left) = Edge(middle, middle_bottom, skip_lower);
   fill_rows(modes, t, y, lower, left, right);
 }
