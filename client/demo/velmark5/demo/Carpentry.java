@@ -35,7 +35,7 @@ final class Carpentry {
       int green = new int[] {0x2C5B34, 0x336638, 0x3A723E, 0x437E43, 0x4E8B49}[i];
       var needles = new TextureMapping.Cylinder(TextureMapping.Direction.DOWN, i * 37, 150, 3072, 0, 40 * i);
       s.at(0, 0, 0, 0.7 * i + seed);
-      s.lathe(9, 0.16, seed * 7 + i, wrapped(green, Textures.LEAVES, needles),
+      s.lathe(8, 0.16, seed * 7 + i, wrapped(green, Textures.LEAVES, needles),
           0, low + 16, radius, low, radius * 0.55, low + tall * 0.12, 0, low + tall * (i == layers - 1 ? 0.24 : 0.29));
     }
     return s.build();

@@ -15,7 +15,7 @@ import velmark5.TextureMapping;
  * place that it is made for, at the height of the sea.
  */
 final class Decals {
-  private static final int SIDES = 8;
+  private static final int SIDES = 6;
   private static final double PATH_WIDTH = 66;
 
   /** A mesh, and the place of its origin. */
@@ -29,7 +29,7 @@ final class Decals {
 
   /** The soft shadow around what stands at a place. */
   Decal shadow(double x, double z, double radius) {
-    return disc(x, z, radius * 1.35, 6, Hsl.of(0.6, 0.3, 0.02), Textures.GLOW);
+    return disc(x, z, radius * 1.3, 6, Hsl.of(0.6, 0.3, 0.02), Textures.GLOW);
   }
 
   /** The light that a lamp throws on the ground. */

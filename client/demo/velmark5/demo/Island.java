@@ -156,7 +156,7 @@ final class Island {
     double h = shore < 0 ? Math.max(-170, shore * 0.20) : 105 * (1 - Math.exp(-shore / 520));
     double within = step(0, 700, shore);
     h += within * (90 * Noise.smooth(11, x / 560 + 40, z / 560 + 40) - 35 + 22 * Noise.smooth(12, x / 170 + 40, z / 170 + 40));
-    h = mix(h, 84, step(950, 560, Math.hypot(x - VILLAGE_X, z - VILLAGE_Z)));
+    h = mix(h, 84, step(1150, 800, Math.hypot(x - VILLAGE_X, z - VILLAGE_Z)));
     h += 280 * Math.exp(-Math.pow(Math.hypot(x - MILL_X, z - MILL_Z) / 430, 2));
     h = mix(h, 150, step(560, 300, Math.hypot(x - MOUND_X, z - MOUND_Z)));
 

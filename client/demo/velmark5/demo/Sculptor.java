@@ -239,7 +239,7 @@ final class Sculptor {
       profile[2 * i] = i == 0 || i == rings - 1 ? 0 : radius * Math.cos(angle);
       profile[2 * i + 1] = up + radius * squash * Math.sin(angle);
     }
-    lathe(9, bumps, seed, material, profile);
+    lathe(8, bumps, seed, material, profile);
   }
 
   /** A strip of quadrangles between two rows of corners, seen from above: left and right as one walks along. */

@@ -22,9 +22,9 @@ final class Terrain {
   /** Half the side of the square of land. */
   static final double REACH = 3456;
 
-  private static final double TILE = 96;
+  private static final double TILE = 108;
   private static final int TILES = (int) (2 * REACH / TILE);
-  private static final int TILES_PER_PATCH = 12;
+  private static final int TILES_PER_PATCH = 11;
 
   /** Ground that lies deeper is not built: the sea above it lets nothing through. */
   private static final double DEEPEST = -168;

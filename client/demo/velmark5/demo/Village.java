@@ -1,6 +1,7 @@
 package velmark5.demo;
 
 import java.util.ArrayList;
+import java.util.Arrays;
 import java.util.Comparator;
 import java.util.List;
 import velmark5.Matrix;
@@ -178,15 +179,17 @@ final class Village implements Scene {
   }
 
   private void light(int[] numbers) {
-    if (!burning.isEmpty()) {
-      List<PointLight> near = new ArrayList<>(numbers.length);
-      for (int number : numbers) {
-        near.add(burning.get(number));
-      }
-      toolkit.setPointLights(near);
-    } else {
-      toolkit.setPointLights(List.of());
-    }
+    toolkit.setPointLights(
+        burning.isEmpty() ? burning : Arrays.stream(numbers).mapToObj(burning::get).toList());
+  }
+
+  /** Light for those who walk right under the lamps, which would blind them: from farther up, and weaker. */
+  private void lightWalkers() {
+    toolkit.setPointLights(
+        burning.stream()
+            .limit(4)
+            .map(l -> new PointLight(l.x(), l.y() - 130, l.z(), l.range(), l.colour(), 0.35f * l.strength()))
+            .toList());
   }
 
   private void drawMill(double seconds) {
@@ -197,7 +200,7 @@ final class Village implements Scene {
   }
 
   private void drawWanderers(double seconds) {
-    light(new int[] {0, 1, 2, 3});
+    lightWalkers();
     for (int i = 0; i < robes.size(); i++) {
       double pace = seconds / 70 + 0.24 + i * 0.31;
       double[] p = Island.walk(pace - Math.floor(pace));
