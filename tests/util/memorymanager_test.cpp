@@ -295,6 +295,15 @@ TEST_F(pools, storage_is_aligned_zeroed_and_filled_to_its_last_byte) {
   EXPECT_EQ(pool.calls, "()()()");
 }
 
+TEST_F(pools, an_empty_pool_takes_a_first_block_up_to_the_end_of_its_slack) {
+  for (const unsigned int beyond : {0u, 1u}) {
+    open_pool pool(1000);
+    const unsigned int length = 1000 + memorymanager::slack + beyond;
+    std::memset(pool.allocate(length).address, 1, length);
+    EXPECT_EQ(pool.size, beyond == 0 ? 1000u : 1100u);
+  }
+}
+
 TEST_F(pools, growth_is_a_tenth_in_single_precision) {
   for (const unsigned int size : {10u, 19u, 99u, 9999999u, (1u << 24) - 3, (1u << 24) + 1, 18000001u, 33554435u}) {
     open_pool pool(size);
