@@ -5,16 +5,7 @@ import org.junit.jupiter.api.AfterEach;
 import org.junit.jupiter.api.BeforeEach;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.function.Executable;
-import velmark5.Hsl;
-import velmark5.Material;
-import velmark5.Matrix;
-import velmark5.MemoryPool;
-import velmark5.Mesh;
-import velmark5.ModelSettings;
-import velmark5.NativeLibrary;
-import velmark5.Rect;
-import velmark5.Spans;
-import velmark5.ToolkitTest;
+import velmark5.*;
 
 /** The natives called wrongly, past the API: each way in which they refuse, seen by a real runtime; nothing changes. */
 class PeersTest extends ToolkitTest {

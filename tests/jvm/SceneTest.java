@@ -4,20 +4,9 @@ import java.util.ArrayList;
 import java.util.Collections;
 import java.util.List;
 import org.junit.jupiter.api.Test;
-import velmark5.BlendMode;
-import velmark5.Colour;
-import velmark5.Matrix;
-import velmark5.PointLight;
-import velmark5.Rect;
-import velmark5.Sun;
-import velmark5.TextureMetrics;
-import velmark5.TextureSource;
-import velmark5.ThreadResource;
-import velmark5.Toolkit;
-import velmark5.ToolkitTest;
-import velmark5.Water;
+import velmark5.*;
 
-/** Camera, scene state, textures, triangles. */
+/** Camera, scene state, textures. */
 class SceneTest extends ToolkitTest {
   @Test
   void theCameraSeesTheWorldUprightAndInOrder() {
@@ -113,29 +102,5 @@ class SceneTest extends ToolkitTest {
     refuses(ArithmeticException.class, () -> Toolkit.create(source, 1));
     refuses(IllegalArgumentException.class, () -> Toolkit.create(source, 65536));
     refuses(NullPointerException.class, () -> Toolkit.create(null, 1));
-  }
-
-  @Test
-  void trianglesAndThickLines() {
-    toolkit.drawTo(toolkit.createSprite(16, 16), null);
-    toolkit.clear(0);
-    ThreadResource resource = toolkit.createThreadResource();
-    toolkit.setClip(new Rect(4, 0, 8, 16));
-    resource.fillTriangle(0, 0, Colour.BLACK, 0, 32, Colour.BLACK, 32, 0, Colour.WHITE);
-    for (int x = 5; x < 12; x++) {
-      assertTrue(Colour.red(at(x, 0)) > Colour.red(at(x - 1, 0)), "brighter to the right");
-    }
-    assertEquals(0, at(3, 0) | at(12, 0));
-    toolkit.resetClip();
-    toolkit.clear(0);
-    resource.line(2, 8, 13, 8, 0xFF204060, 4, BlendMode.REPLACE);
-    int rows = 0;
-    for (int y = 0; y < 16; y++) {
-      rows += at(7, y) == 0xFF204060 ? 1 : 0;
-    }
-    assertEquals(4, rows, 1);
-    assertEquals(0, at(0, 1));
-    resource.close();
-    refuses(IllegalStateException.class, () -> resource.line(0, 0, 1, 1, -1, 2, BlendMode.REPLACE));
   }
 }

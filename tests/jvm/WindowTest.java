@@ -21,9 +21,7 @@ import org.junit.jupiter.api.AfterEach;
 import org.junit.jupiter.api.BeforeEach;
 import org.junit.jupiter.api.Tag;
 import org.junit.jupiter.api.Test;
-import velmark5.Rect;
-import velmark5.Sprite;
-import velmark5.Toolkit;
+import velmark5.*;
 import velmark5.demo.Demo;
 
 /** Frames in a real window, read back from the screen, with and without shared memory. */

@@ -75,6 +75,22 @@ class DrawingTest extends ToolkitTest {
   }
 
   @Test
+  void trianglesAndThickLines() {
+    ThreadResource resource = toolkit.createThreadResource();
+    assertDraws(() -> resource.line(2, 3, 9, 3, INK, 2, BlendMode.REPLACE),
+        List.of("", "", "..aaaaaaa", "..aaaaaaa"), INK);
+    toolkit.setClip(new Rect(4, 0, 7, 9));
+    toolkit.clear(0);
+    resource.fillTriangle(0, 0, Colour.BLACK, 0, 32, Colour.BLACK, 32, 0, Colour.WHITE);
+    for (int x = 5; x < 11; x++) {
+      assertTrue(Colour.red(at(x, 0)) > Colour.red(at(x - 1, 0)), "brighter to the right");
+    }
+    assertEquals(PAPER, at(3, 0) & at(11, 0));
+    resource.close();
+    refuses(IllegalStateException.class, () -> resource.line(0, 0, 1, 1, -1, 2, BlendMode.REPLACE));
+  }
+
+  @Test
   void masksCutByTheClip() {
     ClippingMask mask = toolkit.createMask(pool, new Spans(9, 3, new int[] {0, 4, 8}, new int[] {9, 2, 0}));
     Runnable spans = () -> toolkit.fillMask(INK, mask, 3, 1);

@@ -19,45 +19,36 @@ class LifecycleTest extends ToolkitTest {
     Toolkit first = toolkit;
     refuses(IllegalStateException.class, Toolkit::create);
     int before = first.allocatedBytes();
-    MemoryPool pool = first.createPool(1000);
-    first.setPool(pool);
-    ClippingMask mask = first.createMask(pool, Spans.ellipse(30, 30));
-    assertEquals(before + 240, first.allocatedBytes(), "two arrays of thirty words");
-    Sprite sprite = first.createSprite(4, 4);
-    DepthBuffer depth = first.createDepthBuffer(4, 4);
-    ThreadResource resource = first.createThreadResource();
-    first.drawTo(sprite, null);
-    first.close();
-    first.close();
+    for (boolean oneByOne : new boolean[] {true, false}) {
+      MemoryPool pool = first.createPool(1000);
+      first.setPool(pool);
+      ClippingMask mask = first.createMask(pool, Spans.ellipse(30, 30));
+      assertEquals(before + 240, first.allocatedBytes(), "two arrays of thirty words");
+      Sprite sprite = first.createSprite(4, 4);
+      DepthBuffer depth = first.createDepthBuffer(4, 4);
+      ThreadResource resource = first.createThreadResource();
+      first.drawTo(sprite, depth);
+      for (AutoCloseable object : oneByOne ? List.of(mask, pool, sprite, depth, resource) : List.of(first)) {
+        object.close();
+        object.close();
+      }
+      assertTrue(pool.isClosed());
+      refusesClosed("clipping mask", mask::width);
+      refusesClosed("sprite", sprite::width);
+      refusesClosed("depth buffer", depth::height);
+      refusesClosed("thread resource", resource::begin);
+      if (oneByOne) {
+        refusesClosed("clipping mask", () -> first.fillMask(0, mask, 0, 0));
+        refusesClosed("memory pool", () -> first.createMask(pool, Spans.ellipse(1, 1)), () -> first.setPool(pool));
+        refusesClosed("sprite", () -> first.drawTo(sprite, null),
+            () -> first.copyFromTarget(sprite, null, new Rect(0, 0, 1, 1), 0, 0));
+        refusesClosed("depth buffer", () -> first.drawTo(null, depth));
+      }
+    }
     refusesClosed("toolkit", () -> first.clear(0), first::targetWidth, () -> first.createSprite(1, 1));
-    refusesClosed("clipping mask", mask::width);
-    refusesClosed("sprite", sprite::width);
-    refusesClosed("depth buffer", depth::height);
-    refusesClosed("thread resource", resource::begin);
-    assertTrue(pool.isClosed());
     toolkit = Toolkit.create();
     assertEquals(before, toolkit.allocatedBytes());
     refusesClosed("toolkit", first::clip);
-    refuses(IllegalStateException.class, () -> toolkit.drawTo(sprite, null));
-  }
-
-  @Test
-  void closedObjectsAreRefusedByName() throws Exception {
-    MemoryPool pool = toolkit.createPool(1000);
-    ClippingMask mask = toolkit.createMask(pool, Spans.ellipse(4, 4));
-    Sprite sprite = toolkit.createSprite(4, 4);
-    DepthBuffer depth = toolkit.createDepthBuffer(4, 4);
-    ThreadResource resource = toolkit.createThreadResource();
-    for (AutoCloseable object : List.of(mask, pool, sprite, depth, resource)) {
-      object.close();
-      object.close();
-    }
-    refusesClosed("clipping mask", () -> toolkit.fillMask(0, mask, 0, 0));
-    refusesClosed("memory pool", () -> toolkit.createMask(pool, Spans.ellipse(1, 1)), () -> toolkit.setPool(pool));
-    refusesClosed("sprite", () -> toolkit.drawTo(sprite, null),
-        () -> toolkit.copyFromTarget(sprite, null, new Rect(0, 0, 1, 1), 0, 0), sprite::width);
-    refusesClosed("depth buffer", () -> toolkit.drawTo(null, depth));
-    refusesClosed("thread resource", resource::begin);
   }
 
   @Test
