@@ -254,11 +254,8 @@ TEST_F(ModelRenderTest, ModelsOfAPoolThatIsGone) {
   const auto frame = colour.copy();
   Java_ba_ma(env, pool_peer);
   if (VELMARK5_CHECKS) {
-    const std::string exception = "java.lang.IllegalStateException: model: its pool is gone";
-    draw(object, placed(0, 0, 1, 0, 0, 400));
-    EXPECT_EQ(java.take_exception(), exception);
-    Java_h_N(env, object);
-    EXPECT_EQ(java.take_exception(), exception);
+    expect_raised("java.lang.IllegalStateException: model: its pool is gone",
+                  {[&] { draw(object, placed(0, 0, 1, 0, 0, 400)); }, [&] { Java_h_N(env, object); }});
     EXPECT_TRUE(same_image(colour, frame.data()));
   }
   Java_h_ma(env, object);

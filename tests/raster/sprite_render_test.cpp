@@ -69,17 +69,13 @@ class sprite_render : public sprite_scene {
   }
 
   call random_call(test_random& random) {
-    call n{random.between(-30, 60),
-           random.between(-30, 40),
-           random.between(-4, 4),
-           random.between(-20, 130),
-           random.between(-20, 90),
-           {random.real(-20, 70), random.real(-20, 50)},
-           {},
-           mask.x,
-           mask.y};
+    call n;
+    n.x = random.between(-30, 60), n.y = random.between(-30, 40), n.z = random.between(-4, 4);
+    n.w = random.between(-20, 130), n.h = random.between(-20, 90);
+    n.mask_x = mask.x, n.mask_y = mask.y;
     // Turned, sheared and scaled.
     float* const c = n.corners;
+    c[0] = random.real(-20, 70), c[1] = random.real(-20, 50);
     for (int i = 2; i < 6; ++i) c[i] = c[i % 2] + random.real(-40, 40);
     if (random.one_in(3)) {  // axes along the target's, in whole pixels
       for (int i = 0; i < 6; ++i) c[i] = static_cast<float>(static_cast<int>(c[i]));
@@ -240,8 +236,7 @@ TEST_F(sprite_render, zero_handles_raise) {
   test_random random(3);
   random_sprite(random, 2, 2, false);
   for (int how = 0; how < ways; ++how) {
-    draw(way(how), how < masked ? 0 : handle(), 0, {});
-    EXPECT_EQ(java.take_exception(), "java.lang.NullPointerException: ") << how;
+    EXPECT_EQ(raised([&] { draw(way(how), how < masked ? 0 : handle(), 0, {}); }), "java.lang.NullPointerException: ");
   }
 }
 

@@ -255,25 +255,16 @@ TEST_F(TextureNatives, OnlyTrueIsAnAnswer) {
 
 TEST_F(TextureNatives, BadUploadsRaiseAndChangeNothing) {
   const auto array = [this](std::size_t length) { return java.new_ints(std::vector<jint>(length, 5)); };
-  const auto state = [] {
-    const auto* const bytes = reinterpret_cast<const char*>(kit().textures);
-    return std::string(bytes, sizeof(texturecache));
-  };
+  const auto state = [] { return std::string(reinterpret_cast<const char*>(kit().textures), sizeof(texturecache)); };
   const std::string before = state(), argument = "java.lang.IllegalArgumentException: id: ";
   const std::string bounds = "java.lang.ArrayIndexOutOfBoundsException: pixels: length ";
-  const std::pair<std::function<void()>, std::string> uploads[] = {
-      {[&] { metrics(300); }, argument + "300 is not below the number of textures, 300"},
-      {[&] { metrics(-1); }, argument + "65535 is not below the number of textures, 300"},
-      {[&] { pixels(300, array(16384)); }, argument + "300 is not below the number of textures, 300"},
-      {[&] { pixels(3, nullptr); }, "java.lang.NullPointerException: "},
-      {[&] { pixels(3, array(16383)); }, bounds + "16383, 16384 needed"},
-      {[&] { pixels(3, array(16385)); }, bounds + "16385, 16384 needed"},
-  };
-  for (const auto& [upload, exception] : uploads) {
-    upload();
-    EXPECT_EQ(java.take_exception(), exception);
-    EXPECT_TRUE(state() == before) << exception;
-  }
+  expect_raised(argument + "300 is not below the number of textures, 300",
+                {[&] { metrics(300); }, [&] { pixels(300, array(16384)); }});
+  expect_raised(argument + "65535 is not below the number of textures, 300", {[&] { metrics(-1); }});
+  expect_raised("java.lang.NullPointerException: ", {[&] { pixels(3, nullptr); }});
+  expect_raised(bounds + "16383, 16384 needed", {[&] { pixels(3, array(16383)); }});
+  expect_raised(bounds + "16385, 16384 needed", {[&] { pixels(3, array(16385)); }});
+  EXPECT_TRUE(state() == before);
 }
 
 TEST_F(toolkit_fixture, TexturesWithoutASourceAreRefused) {
