@@ -1,6 +1,6 @@
 /**
- * What a toolkit draws to, as this side knows it: a canvas, or a sprite, a depth buffer or both, or nothing. The library
- * holds bare pointers to it, so a part that goes must leave it first.
+ * What a toolkit draws to, as this side knows it: a canvas, or a sprite, a depth buffer or both, or nothing. The
+ * library holds bare pointers to it, so a part that goes must leave it first.
  */
 record Target(za canvas, fa sprite, oa depth, int width, int height) {
   static final Target NOTHING = new Target(null, null, null, 0, 0);

@@ -27,7 +27,9 @@ final class TextureFeed {
     return pixels != null;
   }
 
-  /** With pixels the texture itself, without them what is known of it. The library stores the attributes and reads none. */
+  /**
+   * With pixels the texture itself, without them what is known of it. The library stores the attributes and reads none.
+   */
   private void upload(int id, int[] pixels, TextureMetrics t) {
     short name = (short) id;
     short average = (short) t.averageHsl();

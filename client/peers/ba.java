@@ -39,8 +39,8 @@ final class ba extends Peer implements MemoryPool {
   }
 
   /**
-   * With objects alive, or the toolkit pointing here, only the storage goes: the small rest must outlive them. Otherwise
-   * all of it goes.
+   * With objects alive, or the toolkit pointing here, only the storage goes: the small rest must outlive them.
+   * Otherwise all of it goes.
    */
   @Override
   void destroy() {

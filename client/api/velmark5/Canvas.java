@@ -3,11 +3,11 @@ package velmark5;
 import java.awt.Component;
 
 /**
- * A frame and its depth values, shown in a component of AWT. Make it the target with {@link Toolkit#drawTo(Canvas)}, draw,
- * then {@link #present()}.
+ * A frame and its depth values, shown in a component of AWT. Make it the target with {@link Toolkit#drawTo(Canvas)},
+ * draw, then {@link #present()}.
  *
- * <p>Where the display shares memory with its clients there are two images in turn: after a present the canvas holds the
- * frame before the last one, so each frame starts with a clear.
+ * <p>Where the display shares memory with its clients there are two images in turn: after a present the canvas holds
+ * the frame before the last one, so each frame starts with a clear.
  */
 public interface Canvas extends AutoCloseable {
   /**
@@ -25,8 +25,8 @@ public interface Canvas extends AutoCloseable {
   int height();
 
   /**
-   * Gives the canvas a new size. Frame and depth start anew; if the canvas is the target it stays so, with a black frame
-   * and the clip and viewport of the new size.
+   * Gives the canvas a new size. Frame and depth start anew; if the canvas is the target it stays so, with a black
+   * frame and the clip and viewport of the new size.
    *
    * @param width columns, at least 1
    * @param height rows, at least 1

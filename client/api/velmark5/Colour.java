@@ -1,8 +1,8 @@
 package velmark5;
 
 /**
- * Colours as words of the form 0xAARRGGBB. All arguments are 0 to 255 unless a method says otherwise; bits above the low
- * eight are ignored.
+ * Colours as words of the form 0xAARRGGBB. All arguments are 0 to 255 unless a method says otherwise; bits above the
+ * low eight are ignored.
  */
 public final class Colour {
   /** Opaque black. */

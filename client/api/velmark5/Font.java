@@ -3,9 +3,9 @@ package velmark5;
 /**
  * Text in one typeface and size. Made by the toolkit from {@link Glyphs}; lives in a pool.
  *
- * <p>Positions are those of the baseline, on which letters stand. A line feed starts the next line. A character without a
- * glyph is shown as a question mark if there is one, else left out. Drawing is cut to the toolkit's clip rectangle and
- * does nothing without a frame.
+ * <p>Positions are those of the baseline, on which letters stand. A line feed starts the next line. A character without
+ * a glyph is shown as a question mark if there is one, else left out. Drawing is cut to the toolkit's clip rectangle
+ * and does nothing without a frame.
  */
 public interface Font extends AutoCloseable {
   /**

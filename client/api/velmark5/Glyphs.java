@@ -14,7 +14,9 @@ import java.util.Objects;
 import java.util.function.IntUnaryOperator;
 import java.util.stream.IntStream;
 
-/** The pictures and measures of a set of characters, from which a {@link Font} is made. Made from any font of Java 2D. */
+/**
+ * The pictures and measures of a set of characters, from which a {@link Font} is made. Made from any font of Java 2D.
+ */
 public final class Glyphs {
   /** The printable characters of Latin text: what most western European languages need. */
   public static final String LATIN =

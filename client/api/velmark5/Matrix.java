@@ -3,9 +3,9 @@ package velmark5;
 import java.util.Arrays;
 
 /**
- * Four rows of four floats that move points. Points are rows: a point (x, y, z, 1) becomes x times row 0, plus y times row
- * 1, plus z times row 2, plus row 3, which is the translation. The world's y points down, and so does the screen's; seen by
- * the camera x points right and z into the screen. Matrices do not change.
+ * Four rows of four floats that move points. Points are rows: a point (x, y, z, 1) becomes x times row 0, plus y times
+ * row 1, plus z times row 2, plus row 3, which is the translation. The world's y points down, and so does the screen's;
+ * seen by the camera x points right and z into the screen. Matrices do not change.
  */
 public final class Matrix {
   /** Leaves every point where it is. */

@@ -6,8 +6,8 @@ package velmark5;
  */
 public interface MemoryPool extends AutoCloseable {
   /**
-   * Gives the memory back. What still lives in the pool may be closed later; until then fonts and masks draw nothing, and
-   * to draw a model is an {@link IllegalStateException}.
+   * Gives the memory back. What still lives in the pool may be closed later; until then fonts and masks draw nothing,
+   * and to draw a model is an {@link IllegalStateException}.
    *
    * @throws IllegalStateException inside a memory pressure listener
    */

@@ -8,10 +8,10 @@ import java.util.Objects;
 import java.util.Set;
 
 /**
- * A decoded mesh, from which models are made: vertices, faces with their materials, groups for animation, billboards. The
- * x axis points to the right, y downward, z away. A face is seen from the side from which its corners run
- * counter-clockwise. Coordinates count from the point about which the model turns; bounds and radii of models are 16 bits
- * wide, so vertices stay within 32767 units of it.
+ * A decoded mesh, from which models are made: vertices, faces with their materials, groups for animation, billboards.
+ * The x axis points to the right, y downward, z away. A face is seen from the side from which its corners run
+ * counter-clockwise. Coordinates count from the point about which the model turns; bounds and radii of models are 16
+ * bits wide, so vertices stay within 32767 units of it.
  */
 public final class Mesh {
   /** The most vertices, and the most faces, of one mesh. */

@@ -33,9 +33,9 @@ public interface Scene {
   void setSun(Sun sun);
 
   /**
-   * Sets the fog of the distance. Fog grows from where it begins to the far plane, where nothing else is seen. Before the
-   * first call it is black and begins 255 units before the far plane. A model is in it as a whole or not at all, see {@link
-   * ThreadResource#draw}.
+   * Sets the fog of the distance. Fog grows from where it begins to the far plane, where nothing else is seen. Before
+   * the first call it is black and begins 255 units before the far plane. A model is in it as a whole or not at all,
+   * see {@link ThreadResource#draw}.
    *
    * @param colour what far things fade to, 0xRRGGBB
    * @param depth how far before the far plane fog begins, in units of the world; 0 or less for no fog

@@ -1,8 +1,8 @@
 package velmark5;
 
 /**
- * An image of 0xAARRGGBB pixels: something to draw, and a target to draw to. Its full size is the stored pixels plus the
- * {@linkplain #margins() margins} that were trimmed.
+ * An image of 0xAARRGGBB pixels: something to draw, and a target to draw to. Its full size is the stored pixels plus
+ * the {@linkplain #margins() margins} that were trimmed.
  */
 public interface Sprite extends AutoCloseable {
   /**
@@ -92,8 +92,8 @@ public interface Sprite extends AutoCloseable {
   }
 
   /**
-   * Draws the sprite. Like all drawing of sprites this is cut to the toolkit's clip rectangle, and does nothing without a
-   * frame. Where a sprite is drawn onto its own pixels, while it is the target, they become undefined.
+   * Draws the sprite. Like all drawing of sprites this is cut to the toolkit's clip rectangle, and does nothing without
+   * a frame. Where a sprite is drawn onto its own pixels, while it is the target, they become undefined.
    *
    * @param x left edge of the full image
    * @param y top edge of the full image
@@ -112,12 +112,12 @@ public interface Sprite extends AutoCloseable {
   void drawScaled(Rect box, Tint tint, BlendMode mode);
 
   /**
-   * Draws the sprite stretched or shrunk, only where it is not behind what is there; depths stay. Without a depth buffer
-   * every pixel is drawn.
+   * Draws the sprite stretched or shrunk, only where it is not behind what is there; depths stay. Without a depth
+   * buffer every pixel is drawn.
    *
    * @param box where the full image goes
-   * @param depth the sprite's depth in the units of {@link Toolkit#setDepthRange}: it is drawn where the stored depth is not
-   *     smaller. A range of 0 to 1 leaves only 0, in front of everything; a wider one gives whole numbers a meaning
+   * @param depth the sprite's depth in the units of {@link Toolkit#setDepthRange}: it is drawn where the stored depth is
+   *     not smaller. A range of 0 to 1 leaves only 0, in front of everything; a wider one gives whole numbers a meaning
    * @param tint a change of colours on the way
    * @param mode how the result combines with the frame
    */

@@ -1,9 +1,9 @@
 package velmark5;
 
 /**
- * Where textures come from. The library keeps the pixels of the 200 textures that were used last and asks for others when
- * they are needed, in the middle of drawing and on the thread that draws. What it throws then goes to that thread's
- * uncaught exception handler, and the faces are drawn without the texture.
+ * Where textures come from. The library keeps the pixels of the 200 textures that were used last and asks for others
+ * when they are needed, in the middle of drawing and on the thread that draws. What it throws then goes to that
+ * thread's uncaught exception handler, and the faces are drawn without the texture.
  */
 public interface TextureSource {
   /** Columns and rows of every texture. */

@@ -3,13 +3,13 @@ package velmark5;
 import java.util.Optional;
 
 /**
- * What one thread needs to draw models, triangles and thick lines. Each worker thread of the client has its own. Made and
- * closed on the control thread, used by one thread at a time.
+ * What one thread needs to draw models, triangles and thick lines. Each worker thread of the client has its own. Made
+ * and closed on the control thread, used by one thread at a time.
  *
- * <p>Nothing here locks, so this is what several threads may draw at the same time, into different pixels of the target,
- * while the control thread changes nothing: triangles, lines, and models without textures that have been drawn before.
- * The first draw of a model takes memory of its pool, and a textured face moves its texture in the list of those used
- * last: both belong to one thread at a time.
+ * <p>Nothing here locks, so this is what several threads may draw at the same time, into different pixels of the
+ * target, while the control thread changes nothing: triangles, lines, and models without textures that have been drawn
+ * before. The first draw of a model takes memory of its pool, and a textured face moves its texture in the list of
+ * those used last: both belong to one thread at a time.
  */
 public interface ThreadResource extends AutoCloseable {
   /** Tells the library that the calling thread starts to draw with this resource. Call it on the thread that draws. */
@@ -21,8 +21,8 @@ public interface ThreadResource extends AutoCloseable {
   /**
    * Draws a model on the toolkit's target; without a target, nothing.
    *
-   * <p>A model is in the distance fog as a whole or not at all: when an end of its upright axis lies beyond where the fog
-   * begins. Its light is that of its mesh as it was built: the matrix does not turn the sun's effect along.
+   * <p>A model is in the distance fog as a whole or not at all: when an end of its upright axis lies beyond where the
+   * fog begins. Its light is that of its mesh as it was built: the matrix does not turn the sun's effect along.
    *
    * @param model the model, whose pool is open
    * @param matrix from the model to the world
@@ -41,8 +41,8 @@ public interface ThreadResource extends AutoCloseable {
   Optional<ScreenPlacement> drawPlaced(Model model, Matrix matrix);
 
   /**
-   * Draws a triangle on the toolkit's target, cut to its clip rectangle, in front of everything. Colours run smoothly from
-   * corner to corner; the corners may come in any order.
+   * Draws a triangle on the toolkit's target, cut to its clip rectangle, in front of everything. Colours run smoothly
+   * from corner to corner; the corners may come in any order.
    *
    * @param x0 column of the first corner
    * @param y0 row of the first corner

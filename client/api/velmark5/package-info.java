@@ -3,8 +3,8 @@
  *
  * <p>Everything starts with {@link velmark5.Toolkit#create()}; the toolkit makes all other objects and draws. Objects
  * hold memory outside the Java heap: close them, or close the toolkit, which closes what is left. A call on a closed
- * object throws {@link IllegalStateException}. No argument may be null unless its description says so: a null where none
- * is allowed is a {@link NullPointerException}.
+ * object throws {@link IllegalStateException}. No argument may be null unless its description says so: a null where
+ * none is allowed is a {@link NullPointerException}.
  *
  * <p>All calls belong to one thread of the client's choice, the <em>control thread</em>, except where a method says
  * otherwise. Nothing here locks.

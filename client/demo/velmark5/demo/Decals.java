@@ -10,13 +10,17 @@ import velmark5.Mesh;
 import velmark5.TextureMapping;
 
 /**
- * What lies flat on the land: shadows, the light of lamps, trodden ground, the river's bed. Each is cut out of the land's own
- * triangles and a little raised, so that it follows every bend; its texture fades at its edge. A mesh has its origin at the
- * place that it is made for, at the height of the sea.
+ * What lies flat on the land: shadows, the light of lamps, trodden ground, the river's bed. Each is cut out of the
+ * land's own triangles and a little raised, so that it follows every bend; its texture fades at its edge. A mesh has
+ * its origin at the place that it is made for, at the height of the sea.
  */
 final class Decals {
   private static final int SIDES = 6;
+
+  /** From the middle of a path to where it has faded, and how long its straight parts are. */
   private static final double PATH_WIDTH = 66;
+
+  private static final double PATH_PART = 170;
 
   /** A mesh, and the place of its origin. */
   record Decal(Mesh mesh, double x, double z) {}
@@ -51,7 +55,8 @@ final class Decals {
     }
     double up = Island.height(x, z);
     TextureMapping plane = new TextureMapping.Plane(
-        s.corner(x - radius, up, z + radius), s.corner(x + radius, up, z + radius), s.corner(x - radius, up, z - radius));
+        s.corner(x - radius, up, z + radius), s.corner(x + radius, up, z + radius),
+        s.corner(x - radius, up, z - radius));
     lay(s, outline, lift, Material.of(colour).textured(texture, plane), new HashMap<>());
     return new Decal(s.build(), x, z);
   }
@@ -60,7 +65,8 @@ final class Decals {
   List<Decal> path(double[][] corners) {
     List<double[]> line = new ArrayList<>();
     for (int i = 0; i + 1 < corners.length; i++) {
-      int parts = (int) Math.ceil(Math.hypot(corners[i + 1][0] - corners[i][0], corners[i + 1][1] - corners[i][1]) / 170);
+      double length = Math.hypot(corners[i + 1][0] - corners[i][0], corners[i + 1][1] - corners[i][1]);
+      int parts = (int) Math.ceil(length / PATH_PART);
       for (int k = 0; k < parts + (i + 2 == corners.length ? 1 : 0); k++) {
         line.add(Sculptor.between(corners[i], corners[i + 1], k / (double) parts));
       }

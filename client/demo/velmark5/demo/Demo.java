@@ -20,8 +20,8 @@ import velmark5.Sprite;
 import velmark5.Toolkit;
 
 /**
- * The demo's main program: opens a window, draws the scenes into it until it is closed, and says once a second how fast.
- * Without a display it draws into an image.
+ * The demo's main program: opens a window, draws the scenes into it until it is closed, and says once a second how
+ * fast. Without a display it draws into an image.
  */
 public final class Demo {
   private static final double FRAMES_PER_SECOND = 60;

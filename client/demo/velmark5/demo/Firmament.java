@@ -157,7 +157,8 @@ final class Firmament implements Scene {
     }
     int radius = height / 26;
     shine(point, 15 * radius, Colour.scale(day.light(), 0.30));
-    toolkit.fillCircle((int) point.x(), (int) point.y(), radius, Colour.mix(day.light(), Colour.WHITE, 0.5), BlendMode.REPLACE);
+    int disc = Colour.mix(day.light(), Colour.WHITE, 0.5);
+    toolkit.fillCircle((int) point.x(), (int) point.y(), radius, disc, BlendMode.REPLACE);
   }
 
   private void shine(Matrix.ScreenPoint point, int reach, int light) {
@@ -173,9 +174,11 @@ final class Firmament implements Scene {
     }
     int radius = height / 34;
     shine(point, 6 * radius, 0xFF38404C);
-    toolkit.fillCircle((int) point.x(), (int) point.y(), radius, 0xFFE8ECF4, BlendMode.REPLACE);
-    toolkit.fillCircle((int) point.x() - radius / 3, (int) point.y() - radius / 4, radius / 4, 0xFFCDD3E0, BlendMode.REPLACE);
-    toolkit.fillCircle((int) point.x() + radius / 3, (int) point.y() + radius / 3, radius / 3, 0xFFD4DAE6, BlendMode.REPLACE);
+    int x = (int) point.x();
+    int y = (int) point.y();
+    toolkit.fillCircle(x, y, radius, 0xFFE8ECF4, BlendMode.REPLACE);
+    toolkit.fillCircle(x - radius / 3, y - radius / 4, radius / 4, 0xFFCDD3E0, BlendMode.REPLACE);
+    toolkit.fillCircle(x + radius / 3, y + radius / 3, radius / 3, 0xFFD4DAE6, BlendMode.REPLACE);
   }
 
   private void paintClouds(double seconds) {

@@ -7,7 +7,9 @@ import velmark5.Font;
 import velmark5.MemoryPool;
 import velmark5.Toolkit;
 
-/** What is written over the picture, in all three kinds of font: the name, the frame rate, labels of the instruments. */
+/**
+ * What is written over the picture, in all three kinds of font: the name, the frame rate, labels of the instruments.
+ */
 final class Hud implements Scene {
   private static final int GOLD = 0xFFFFD9A0;
   private static final int ICE = 0xFFCFE4FF;

@@ -8,8 +8,8 @@ import velmark5.ThreadResource;
 import velmark5.Toolkit;
 
 /**
- * A polished knot that turns above the lake: triangles with a colour per corner, taken from what the corner mirrors of the
- * night around it. Farther triangles are drawn first.
+ * A polished knot that turns above the lake: triangles with a colour per corner, taken from what the corner mirrors of
+ * the night around it. Farther triangles are drawn first.
  */
 final class Knot implements Scene {
   private static final int AROUND = 240;

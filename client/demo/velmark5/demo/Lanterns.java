@@ -7,7 +7,10 @@ import velmark5.Sprite;
 import velmark5.Tint;
 import velmark5.Toolkit;
 
-/** Paper lanterns that rise from the far shore: a halo, drawn once into a sprite and added at every size, around a warm core. */
+/**
+ * Paper lanterns that rise from the far shore: a halo, drawn once into a sprite and added at every size, around a warm
+ * core.
+ */
 final class Lanterns implements Scene {
   private static final int COUNT = 30;
   private static final int RINGS = 26;

@@ -11,8 +11,9 @@ import velmark5.Model;
 import velmark5.ThreadResource;
 
 /**
- * A wide piece of ground or water. Whether a model gets fog follows from the ends of its axis, so each piece is four models,
- * with the axis at one corner of its box each; the one whose axis is farthest away is drawn, and fog begins where it should.
+ * A wide piece of ground or water. Whether a model gets fog follows from the ends of its axis, so each piece is four
+ * models, with the axis at one corner of its box each; the one whose axis is farthest away is drawn, and fog begins
+ * where it should.
  */
 final class Patch {
   /** Builds a piece, in the world's coordinates. */

@@ -10,8 +10,8 @@ import java.util.Set;
 import velmark5.Matrix;
 
 /**
- * The camera. It flies around the village by itself until a key or the mouse takes over: drag to look, W A S D or the arrow
- * keys to move, Q and E for down and up, Shift to hurry, F to fly by itself again.
+ * The camera. It flies around the village by itself until a key or the mouse takes over: drag to look, W A S D or the
+ * arrow keys to move, Q and E for down and up, Shift to hurry, F to fly by itself again.
  */
 final class Pilot {
   private static final double CLEARANCE = 130;
@@ -102,8 +102,8 @@ final class Pilot {
   }
 
   /**
-   * How far out its way goes: over the bay in the south, close to the village under the cliffs in the north, around the mill in the
-   * west.
+   * How far out its way goes: over the bay in the south, close to the village under the cliffs in the north, around the
+   * mill in the west.
    */
   private static double orbit(double angle) {
     double west = Math.max(0, -Math.cos(angle));

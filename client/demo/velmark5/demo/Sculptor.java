@@ -8,8 +8,8 @@ import velmark5.Mesh;
 import velmark5.TextureMapping;
 
 /**
- * Builds meshes from simple solids. Heights count upward here, and the ground lies at 0; the mesh has them downward. Shapes
- * are placed around a foot point that can be moved and turned.
+ * Builds meshes from simple solids. Heights count upward here, and the ground lies at 0; the mesh has them downward.
+ * Shapes are placed around a foot point that can be moved and turned.
  */
 final class Sculptor {
   private static final double CELL = 150;
@@ -72,8 +72,8 @@ final class Sculptor {
   }
 
   /**
-   * The plane that lays one repeat of a texture over each so many units of the ground. Planes of one size fit each other,
-   * whatever the place they are made for.
+   * The plane that lays one repeat of a texture over each so many units of the ground. Planes of one size fit each
+   * other, whatever the place they are made for.
    */
   TextureMapping groundPlane(double size, double[] near) {
     return plane(size, near, new double[] {1, 0, 0}, new double[] {0, 0, -1});
@@ -95,8 +95,8 @@ final class Sculptor {
   }
 
   /**
-   * A flat panel, cut into small faces. Its corners, three numbers each, run from the upper left one down, right and up as
-   * it is seen from its front; its texture is repeated across and down.
+   * A flat panel, cut into small faces. Its corners, three numbers each, run from the upper left one down, right and up
+   * as it is seen from its front; its texture is repeated across and down.
    */
   void panel(double[] corners, Material material, double across, double down) {
     double[] topLeft = {corners[0], corners[1], corners[2]};

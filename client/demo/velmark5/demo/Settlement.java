@@ -19,7 +19,12 @@ final class Settlement {
   private static final int UNEARTHLY = 0x50C8FF;
 
   /** A light of the night. */
-  record Lamp(double x, double up, double z, int range, int colour, double flicker) {}
+  record Lamp(double x, double up, double z, int range, int colour, double flicker) {
+    /** How far a place lies outside of the light, negative inside. */
+    double beyondLight(double placeX, double placeZ) {
+      return Math.hypot(x - placeX, z - placeZ) - range;
+    }
+  }
 
   /** What stands still, and the numbers of the lamps that are nearest to it. */
   record Prop(Model model, Matrix place, double x, double z, int[] lamps) {}
@@ -61,6 +66,11 @@ final class Settlement {
     list.add(new Prop(model, place, x, z, nearestLamps(x, z)));
   }
 
+  /** Puts something on the ground. */
+  private void stand(List<Prop> list, Model model, double x, double z, double scale) {
+    put(list, model, x, Island.height(x, z), z, scale);
+  }
+
   private void lay(List<Prop> list, Decals.Decal decal) {
     put(list, maker.apply(decal.mesh()), decal.x(), 0, decal.z(), 1);
   }
@@ -69,7 +79,7 @@ final class Settlement {
   int[] nearestLamps(double x, double z) {
     return IntStream.range(0, lamps.size())
         .boxed()
-        .sorted(Comparator.comparingDouble(i -> Math.hypot(lamps.get(i).x - x, lamps.get(i).z - z) - lamps.get(i).range))
+        .sorted(Comparator.comparingDouble(i -> lamps.get(i).beyondLight(x, z)))
         .limit(4)
         .mapToInt(i -> i)
         .toArray();
@@ -79,10 +89,13 @@ final class Settlement {
     double x = Island.VILLAGE_X;
     double z = Island.VILLAGE_Z;
     lamps.add(new Lamp(x, Island.height(x, z) + 90, z, 720, FLAME, 1));
-    lamps.add(new Lamp(Island.MOUND_X, Island.height(Island.MOUND_X, Island.MOUND_Z) + 210, Island.MOUND_Z - 60, 620, UNEARTHLY, 0.4));
+    double mound = Island.height(Island.MOUND_X, Island.MOUND_Z);
+    lamps.add(new Lamp(Island.MOUND_X, mound + 210, Island.MOUND_Z - 60, 620, UNEARTHLY, 0.4));
     glow(x, z, 620, FLAME);
     glow(Island.MOUND_X, Island.MOUND_Z, 560, UNEARTHLY);
-    double[][] posts = {{300, -190}, {690, -360}, {-490, -800}, {-350, -1420}, {-1010, 60}, {-20, -330}, {1010, -215}, {-340, -2010}};
+    double[][] posts = {
+      {300, -190}, {690, -360}, {-490, -800}, {-350, -1420}, {-1010, 60}, {-20, -330}, {1010, -215}, {-340, -2010}
+    };
     Model post = maker.apply(Carpentry.lampPost());
     Model dark = maker.apply(Carpentry.lampGlass(false));
     Model lit = maker.apply(Carpentry.lampGlass(true));
@@ -125,8 +138,8 @@ final class Settlement {
     }
     double x = Island.VILLAGE_X;
     double z = Island.VILLAGE_Z;
-    put(props, maker.apply(Carpentry.hearth()), x, Island.height(x, z), z, 1);
-    put(props, maker.apply(Carpentry.mill()), Island.MILL_X, Island.height(Island.MILL_X, Island.MILL_Z), Island.MILL_Z, 1);
+    stand(props, maker.apply(Carpentry.hearth()), x, z, 1);
+    stand(props, maker.apply(Carpentry.mill()), Island.MILL_X, Island.MILL_Z, 1);
     lay(shadows, decals.shadow(Island.MILL_X, Island.MILL_Z, 260));
   }
 
@@ -140,7 +153,7 @@ final class Settlement {
       double px = x + 330 * Math.cos(angle);
       double pz = z + 330 * Math.sin(angle);
       if (Island.pathDistance(px, pz) > 70) {
-        put(props, maker.apply(Carpentry.column(i)), px, Island.height(px, pz), pz, 1);
+        stand(props, maker.apply(Carpentry.column(i)), px, pz, 1);
         lay(shadows, decals.shadow(px, pz, 80));
       }
     }
@@ -166,14 +179,14 @@ final class Settlement {
       double z = far * Math.sin(angle);
       double shore = Island.inland(x, z);
       if (shore > -260 && shore < 420 && Island.riverDistance(x, z) > 150 && Math.abs(x + 330) > 200) {
-        put(props, maker.apply(Carpentry.boulder(i)), x, Island.height(x, z), z, 0.8 + 1.1 * Noise.hash(i + 560));
+        stand(props, maker.apply(Carpentry.boulder(i)), x, z, 0.8 + 1.1 * Noise.hash(i + 560));
       }
     }
     for (int i = 0; i < 16; i++) {
       double[] p = Island.RIVER.get(1 + i * 3 % (Island.RIVER.size() - 24));
       double side = (i % 2 == 0 ? 1 : -1) * (118 + 40 * Noise.hash(i + 580));
       double x = p[0] + side;
-      put(props, maker.apply(Carpentry.boulder(i + 40)), x, Island.height(x, p[1]), p[1], 0.45 + 0.5 * Noise.hash(i + 590));
+      stand(props, maker.apply(Carpentry.boulder(i + 40)), x, p[1], 0.45 + 0.5 * Noise.hash(i + 590));
     }
   }
 

@@ -18,8 +18,8 @@ import velmark5.ThreadResource;
 import velmark5.Toolkit;
 
 /**
- * Rocks that circle around the knot: textured models with light and depth. Those behind the knot are drawn by one instance
- * of the scene, those in front of it by another.
+ * Rocks that circle around the knot: textured models with light and depth. Those behind the knot are drawn by one
+ * instance of the scene, those in front of it by another.
  */
 final class Stones implements Scene {
   /** How many rocks there are. */

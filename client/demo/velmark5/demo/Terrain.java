@@ -15,8 +15,8 @@ import velmark5.Material;
 import velmark5.TextureMapping;
 
 /**
- * The land as triangles: small tiles, their corners moved about so that no grid shows, cut along the lines where one kind of
- * ground meets the next, so that shores, banks and the feet of cliffs are smooth lines.
+ * The land as triangles: small tiles, their corners moved about so that no grid shows, cut along the lines where one
+ * kind of ground meets the next, so that shores, banks and the feet of cliffs are smooth lines.
  */
 final class Terrain {
   /** Half the side of the square of land. */
@@ -105,8 +105,8 @@ final class Terrain {
   }
 
   /**
-   * Cuts every face along the line where a field is 0, and sets a bit in those on its positive side. Neighbours share the
-   * points of their cuts, so no gap opens.
+   * Cuts every face along the line where a field is 0, and sets a bit in those on its positive side. Neighbours share
+   * the points of their cuts, so no gap opens.
    */
   private void cut(int bit, Field field) {
     double[] values = new double[points.size()];
@@ -286,21 +286,26 @@ final class Terrain {
       }
     }
     List<Patch.Shape> shapes = new ArrayList<>();
-    own.forEach((patch, inside) -> shapes.add(s -> carve(s, inside, around.getOrDefault(patch, Set.of()))));
+    own.forEach(
+        (patch, inside) -> {
+          int[] colours = inside.stream().mapToInt(face -> Hsl.ofRgb(colour(face))).toArray();
+          shapes.add(s -> carve(s, inside, colours, around.getOrDefault(patch, Set.of())));
+        });
     return shapes;
   }
 
-  private void carve(Sculptor s, List<Face> inside, Set<Face> around) {
+  private void carve(Sculptor s, List<Face> inside, int[] colours, Set<Face> around) {
     double[] middle = points.get(inside.get(0).a);
     TextureMapping grain = s.groundPlane(300, middle);
     TextureMapping[] rock = {
       s.groundPlane(420, middle), s.wallPlane(420, middle, true), s.wallPlane(420, middle, false)
     };
     Map<Integer, Integer> corners = new HashMap<>();
-    for (Face face : inside) {
+    for (int i = 0; i < colours.length; i++) {
+      Face face = inside.get(i);
       boolean rocky = (face.kind & (ROCKY | SNOWY)) == ROCKY;
-      Material ground = Material.of(Hsl.ofRgb(colour(face)));
-      add(s, face, corners, rocky ? ground.textured(Textures.ROCK, rock[facing(face)]) : ground.textured(Textures.GRAIN, grain));
+      TextureMapping mapping = rocky ? rock[facing(face)] : grain;
+      add(s, face, corners, Material.of(colours[i]).textured(rocky ? Textures.ROCK : Textures.GRAIN, mapping));
     }
     Material unseen = Material.of(0).transparent(255);
     around.forEach(face -> add(s, face, corners, unseen));

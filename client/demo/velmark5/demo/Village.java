@@ -165,7 +165,8 @@ final class Village implements Scene {
     List<PointLight> lights = new ArrayList<>();
     for (int i = 0; i < here.lamps.size() && night > 0.05; i++) {
       Settlement.Lamp lamp = here.lamps.get(i);
-      double flicker = 1 - lamp.flicker() * 0.22 * (0.5 + 0.5 * Math.sin(seconds * (9 + i) + i * 2) * Math.sin(seconds * 5.3 + i));
+      double waves = Math.sin(seconds * (9 + i) + i * 2) * Math.sin(seconds * 5.3 + i);
+      double flicker = 1 - lamp.flicker() * 0.22 * (0.5 + 0.5 * waves);
       lights.add(
           new PointLight(
               (int) lamp.x(), (int) -lamp.up(), (int) lamp.z(), lamp.range(), lamp.colour(), (float) (night * flicker)));
@@ -241,12 +242,14 @@ final class Village implements Scene {
       double t = seconds * 0.13 + i * 0.09 + (i % 3) * 1.9;
       double far = 480 + 130 * (i % 3) + 25 * i;
       double flap = 0.55 * Math.sin(seconds * 7 + i * 1.3) + 0.12;
+      double up = 780 + 60 * (i % 3) + 14 * Math.sin(seconds + i);
       Matrix place =
           Matrix.scaling(0.75, 0.75, 0.75)
               .then(Matrix.rotationY(-t))
-              .then(standing(100 + far * Math.cos(t), 780 + 60 * (i % 3) + 14 * Math.sin(seconds + i), 200 + far * Math.sin(t)));
+              .then(standing(100 + far * Math.cos(t), up, 200 + far * Math.sin(t)));
       resource.draw(wing, Matrix.rotationZ(-flap).then(place));
-      resource.draw(wing, Matrix.rotationZ(-flap).then(Matrix.scaling(1, 1, -1)).then(Matrix.rotationY(Math.PI)).then(place));
+      Matrix other = Matrix.scaling(1, 1, -1).then(Matrix.rotationY(Math.PI)).then(place);
+      resource.draw(wing, Matrix.rotationZ(-flap).then(other));
     }
   }
 

@@ -17,7 +17,10 @@ final class Waters {
 
   private Waters() {}
 
-  /** The sea in sectors around the island: rings along the shore, clear in the shallows, small where the camera comes near. */
+  /**
+   * The sea in sectors around the island: rings along the shore, clear in the shallows, small where the camera comes
+   * near.
+   */
   static List<Patch.Shape> sea() {
     List<Ring> near = new ArrayList<>();
     for (double out = -380; out < 2200; out += out < 340 ? 80 : out < 600 ? 120 : 200) {
