@@ -15,7 +15,7 @@ import velmark5.TextureMapping;
  * its origin at the place that it is made for, at the height of the sea.
  */
 final class Decals {
-  private static final int SIDES = 6;
+  private static final int SIDES = 7;
 
   /** From the middle of a path to where it has faded, and how long its straight parts are. */
   private static final double PATH_WIDTH = 66;
@@ -33,7 +33,7 @@ final class Decals {
 
   /** The soft shadow around what stands at a place. */
   Decal shadow(double x, double z, double radius) {
-    return disc(x, z, radius * 1.3, 6, Hsl.of(0.6, 0.3, 0.02), Textures.GLOW);
+    return disc(x, z, radius * 1.2, 6, Hsl.of(0.6, 0.3, 0.02), Textures.GLOW);
   }
 
   /** The light that a lamp throws on the ground. */
@@ -48,10 +48,12 @@ final class Decals {
 
   private Decal disc(double x, double z, double radius, double lift, int colour, int texture) {
     Sculptor s = new Sculptor().at(-x, 0, -z);
+    // Around the circle at which the texture has faded.
+    double far = radius / Math.cos(Math.PI / SIDES);
     double[][] outline = new double[SIDES][];
     for (int i = 0; i < SIDES; i++) {
       double angle = 2 * Math.PI * (i + 0.5) / SIDES;
-      outline[i] = new double[] {x + radius * Math.cos(angle), z + radius * Math.sin(angle)};
+      outline[i] = new double[] {x + far * Math.cos(angle), z + far * Math.sin(angle)};
     }
     double up = Island.height(x, z);
     TextureMapping plane = new TextureMapping.Plane(
@@ -75,10 +77,11 @@ final class Decals {
     for (int round = 0; round < 3; round++) {
       List<double[]> before = List.copyOf(line);
       for (int i = 1; i + 1 < line.size(); i++) {
-        line.set(i, Sculptor.between(before.get(i), Sculptor.between(before.get(i - 1), before.get(i + 1), 0.5), 0.5));
+        double[] chord = Sculptor.between(before.get(i - 1), before.get(i + 1), 0.5);
+        line.set(i, Sculptor.between(before.get(i), chord, 0.5));
       }
     }
-    return strips(line, PATH_WIDTH, 240, 5, Hsl.ofRgb(0xC9A671), Island.RIVER_EDGE + 20);
+    return new Strip(line, PATH_WIDTH, 240, 5, Hsl.ofRgb(0xC9A671)).pieces(Island.RIVER_EDGE + 20);
   }
 
   /** The gravel on the river's bed and banks, in pieces. */
@@ -87,57 +90,76 @@ final class Decals {
     for (int i = 0; i < Island.RIVER.size(); i += 3) {
       line.add(Island.RIVER.get(i));
     }
-    return strips(line, Island.RIVER_EDGE + 55, 420, 3, Hsl.ofRgb(0xB9AB7E), -1);
+    return new Strip(line, Island.RIVER_EDGE + 55, 420, 3, Hsl.ofRgb(0xB9AB7E)).pieces(-1);
   }
 
-  private List<Decal> strips(List<double[]> line, double wide, double repeat, double lift, int colour, double clear) {
-    List<Decal> decals = new ArrayList<>();
-    Sculptor s = null;
-    Map<List<Long>, Integer> corners = new HashMap<>();
-    double[] origin = null;
-    double way = 0;
-    int count = 0;
-    for (int i = 0; i + 1 < line.size(); i++) {
+  /** A strip along a line of x and z; its texture runs across it once, and on along it from piece to piece. */
+  private final class Strip {
+    private static final int PARTS_PER_PIECE = 8;
+
+    private final List<double[]> line;
+    private final double wide;
+    private final double repeat;
+    private final double lift;
+    private final int colour;
+
+    Strip(List<double[]> line, double wide, double repeat, double lift, int colour) {
+      this.line = line;
+      this.wide = wide;
+      this.repeat = repeat;
+      this.lift = lift;
+      this.colour = colour;
+    }
+
+    /** The strip in pieces, without the parts nearer to the river than a distance. */
+    List<Decal> pieces(double clear) {
+      List<Decal> pieces = new ArrayList<>();
+      double way = 0;
+      for (int i = 0; i + 1 < line.size(); ) {
+        double[] origin = line.get(i);
+        Sculptor s = new Sculptor().at(-origin[0], 0, -origin[1]);
+        Map<List<Long>, Integer> corners = new HashMap<>();
+        int laid = 0;
+        boolean open = true;
+        while (open && laid < PARTS_PER_PIECE && i + 1 < line.size()) {
+          double[] middle = Sculptor.between(line.get(i), line.get(i + 1), 0.5);
+          open = Island.riverDistance(middle[0], middle[1]) >= clear;
+          if (open) {
+            layPart(s, i, way, corners);
+            laid++;
+          }
+          way += Math.hypot(line.get(i + 1)[0] - line.get(i)[0], line.get(i + 1)[1] - line.get(i)[1]);
+          i++;
+        }
+        if (laid > 0) {
+          pieces.add(new Decal(s.build(), origin[0], origin[1]));
+        }
+      }
+      return pieces;
+    }
+
+    /** The part from one point of the line to the next, a way from its start. */
+    private void layPart(Sculptor s, int i, double way, Map<List<Long>, Integer> corners) {
       double[] p = line.get(i);
       double[] q = line.get(i + 1);
+      double[] a = Waters.across(line, i);
+      double[] b = Waters.across(line, i + 1);
+      double[][] outline = {
+        {p[0] - a[0] * wide, p[1] - a[1] * wide}, {q[0] - b[0] * wide, q[1] - b[1] * wide},
+        {q[0] + b[0] * wide, q[1] + b[1] * wide}, {p[0] + a[0] * wide, p[1] + a[1] * wide}
+      };
       double length = Math.hypot(q[0] - p[0], q[1] - p[1]);
-      boolean skipped = Island.riverDistance((p[0] + q[0]) / 2, (p[1] + q[1]) / 2) < clear;
-      if (s != null && (skipped || count == 8)) {
-        decals.add(new Decal(s.build(), origin[0], origin[1]));
-        s = null;
-      }
-      if (!skipped) {
-        if (s == null) {
-          origin = p;
-          s = new Sculptor().at(-p[0], 0, -p[1]);
-          corners.clear();
-          count = 0;
-        }
-        double[] a = Waters.across(line, i);
-        double[] b = Waters.across(line, i + 1);
-        double[][] outline = {
-          {p[0] - a[0] * wide, p[1] - a[1] * wide}, {q[0] - b[0] * wide, q[1] - b[1] * wide},
-          {q[0] + b[0] * wide, q[1] + b[1] * wide}, {p[0] + a[0] * wide, p[1] + a[1] * wide}
-        };
-        // The texture runs across the strip once, and on along it from piece to piece.
-        double dx = (q[0] - p[0]) / length;
-        double dz = (q[1] - p[1]) / length;
-        double back = way % repeat;
-        double x = p[0] - dx * back + dz * wide;
-        double z = p[1] - dz * back - dx * wide;
-        double up = Island.height(p[0], p[1]);
-        TextureMapping plane = new TextureMapping.Plane(
-            s.corner(x, up, z), s.corner(x - 2 * dz * wide, up, z + 2 * dx * wide),
-            s.corner(x + dx * repeat, up, z + dz * repeat));
-        lay(s, outline, lift, Material.of(colour).textured(Textures.TRACK, plane), corners);
-        count++;
-      }
-      way += length;
+      double dx = (q[0] - p[0]) / length;
+      double dz = (q[1] - p[1]) / length;
+      double back = way % repeat;
+      double x = p[0] - dx * back + dz * wide;
+      double z = p[1] - dz * back - dx * wide;
+      double up = Island.height(p[0], p[1]);
+      TextureMapping plane = new TextureMapping.Plane(
+          s.corner(x, up, z), s.corner(x - 2 * dz * wide, up, z + 2 * dx * wide),
+          s.corner(x + dx * repeat, up, z + dz * repeat));
+      lay(s, outline, lift, Material.of(colour).textured(Textures.TRACK, plane), corners);
     }
-    if (s != null) {
-      decals.add(new Decal(s.build(), origin[0], origin[1]));
-    }
-    return decals;
   }
 
   private void lay(Sculptor s, double[][] outline, double lift, Material material, Map<List<Long>, Integer> corners) {
