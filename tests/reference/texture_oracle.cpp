@@ -2,12 +2,14 @@
 
 #include <algorithm>
 
+#include "reference/numbers.h"
+
 namespace oracle {
 namespace {
 
 constexpr float weight[5] = {0.053990968f, 0.24197072f, 0.3989423f, 0.24197072f, 0.053990968f};
 
-int sample(int i, bool wrap) { return wrap ? i & 127 : std::min(std::max(i, 0), 127); }
+int sample(int i, bool wrap) { return wrap ? i & 127 : std::clamp(i, 0, 127); }
 
 // One pass: element i of a line lies `step` words after element i - 1.
 unsigned int blurred_pixel(const unsigned int* line, int step, int i, bool wrap, bool opaque) {
@@ -17,12 +19,10 @@ unsigned int blurred_pixel(const unsigned int* line, int step, int i, bool wrap,
   for (int d = -2; d <= 2; ++d) {
     const unsigned int word = line[sample(i + d, wrap) * step];
     if (!opaque && word == 0) continue;
-    for (int c = 0; c < 4; ++c) channels[c] += static_cast<float>(word >> 8 * c & 0xFF) * weight[d + 2];
+    for (int c = 0; c < 4; ++c) channels[c] += static_cast<float>(channel(word, c)) * weight[d + 2];
     sum += weight[d + 2];
   }
-  unsigned int result = 0;
-  for (int c = 0; c < 4; ++c) result |= static_cast<unsigned int>(channels[c] * (1.0f / sum)) << 8 * c;
-  return result;
+  return word_of([&](int c) { return channels[c] * (1.0f / sum); });
 }
 
 }  // namespace
