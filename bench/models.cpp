@@ -457,23 +457,30 @@ void scene_by_two(benchmark::State& state) {
       meeting.arrive_and_wait();
     }
   });
-  double wall = 0;
+  double wall = 0, clearing = 0, own_half = 0, helper_half = 0;
   for (auto _ : state) {
     const double wall_begin = wall_seconds(), begin = thread_seconds();
     s.clear();
-    const double cleared = thread_seconds();
+    const double cleared = thread_seconds() - begin;
     meeting.arrive_and_wait();
     const double start = thread_seconds();
     s.draw(s.scratch(), left);
     const double own_time = thread_seconds() - start;
     meeting.arrive_and_wait();
     wall += wall_seconds() - wall_begin;
-    state.SetIterationTime(cleared - begin + std::max(own_time, helper_time));
+    state.SetIterationTime(cleared + std::max(own_time, helper_time));
+    clearing += cleared;
+    own_half += own_time;
+    helper_half += helper_time;
   }
   stop = true;
   meeting.arrive_and_wait();
   helper.join();
   report_frames(state, wall);
+  const auto milliseconds = [&](double sum) { return sum * 1000 / static_cast<double>(state.iterations()); };
+  state.counters["clear_ms"] = milliseconds(clearing);
+  state.counters["left_ms"] = milliseconds(own_half);
+  state.counters["right_ms"] = milliseconds(helper_half);
 }
 
 // threads: 0 to draw on the calling thread.
