@@ -4,10 +4,9 @@
 #include <jni.h>
 
 #include <cstddef>
-#include <cstdlib>
-#include <new>
 
 #include "toolkit/toolkit.h"
+#include "util/memorymanager/alignedmemory.h"
 
 class bench_toolkit {
  public:
@@ -30,8 +29,8 @@ class bench_toolkit {
   ~bench_toolkit() {
     kit().colourbuffer = nullptr;
     kit().depthbuffer = nullptr;
-    std::free(colour);
-    std::free(depth);
+    _aligned_free(colour);
+    _aligned_free(depth);
   }
   bench_toolkit(const bench_toolkit&) = delete;
   bench_toolkit& operator=(const bench_toolkit&) = delete;
@@ -56,9 +55,6 @@ class bench_toolkit {
   float* const depth;
 
  private:
-  static void* buffer(std::size_t words) {
-    void* const memory = std::aligned_alloc(64, (words * 4 + 63) / 64 * 64);
-    if (memory == nullptr) throw std::bad_alloc();
-    return memory;
-  }
+  // As canvases and images get theirs.
+  static void* buffer(std::size_t words) { return _aligned_malloc(words * 4, 64); }
 };
