@@ -50,10 +50,6 @@ void* __real_malloc(std::size_t size);
 void* VELMARK5_NEW(__real_)(std::size_t size);
 int __real_posix_memalign(void** out, std::size_t alignment, std::size_t size);
 void* __real_realloc(void* p, std::size_t size);
-void* __wrap_malloc(std::size_t size);
-void* VELMARK5_NEW(__wrap_)(std::size_t size);
-int __wrap_posix_memalign(void** out, std::size_t alignment, std::size_t size);
-void* __wrap_realloc(void* p, std::size_t size);
 
 void* __wrap_malloc(std::size_t size) {
   ++allocations;

@@ -56,12 +56,12 @@ class DrawingTest extends ToolkitTest {
 
   @Test
   void shapesInTheirModes() {
-    Rect box = new Rect(1, 1, 4, 3);
-    List<String> filled = List.of("", ".aaaa", ".aaaa", ".aaaa");
+    Rect box = new Rect(2, 1, 4, 3);
+    List<String> filled = List.of("", "..aaaa", "..aaaa", "..aaaa");
     assertDraws(() -> toolkit.fillRect(box, INK, BlendMode.REPLACE), filled, INK);
     assertDraws(() -> toolkit.fillRect(box, 0x80FFFFFF, BlendMode.ALPHA), filled, 0x809FAFBF);
     assertDraws(() -> toolkit.fillRect(box, 0x01C00101, BlendMode.ADD), filled, 0x01FF6181);
-    assertDraws(() -> toolkit.drawRect(box, 0x01010101, BlendMode.ADD), List.of("", ".aaaa", ".a..a", ".aaaa"),
+    assertDraws(() -> toolkit.drawRect(box, 0x01010101, BlendMode.ADD), List.of("", "..aaaa", "..a..a", "..aaaa"),
         0x01416181);
     assertDraws(() -> toolkit.horizontalLine(-3, 1, 5, INK, BlendMode.REPLACE), List.of("", "aa"), INK);
     assertDraws(() -> toolkit.verticalLine(2, 1, 3, INK, BlendMode.REPLACE), List.of("", "..a", "..a", "..a"), INK);
@@ -132,12 +132,12 @@ class DrawingTest extends ToolkitTest {
   @Test
   void areasAndScrolling() {
     assertDraws(() -> {
-      toolkit.writeArea(new Rect(1, 1, 2, 2), new int[] {9, 9, 1, 2, 9, 3, 4}, 2, 3);
-      assertArrayEquals(new int[] {1, 2, 3, 4}, toolkit.readArea(new Rect(1, 1, 2, 2)));
+      toolkit.writeArea(new Rect(2, 1, 2, 2), new int[] {9, 9, 1, 2, 9, 3, 4}, 2, 3);
+      assertArrayEquals(new int[] {1, 2, 3, 4}, toolkit.readArea(new Rect(2, 1, 2, 2)));
       toolkit.scroll(3, 2);
       toolkit.scroll(0, -100);
-      assertEquals(0xFF000002, toolkit.snapshot().getRGB(5, 3));
-    }, List.of("", ".ab", ".cd", "....ab", "....cd"), 1, 2, 3, 4);
+      assertEquals(0xFF000002, toolkit.snapshot().getRGB(6, 3));
+    }, List.of("", "..ab", "..c", ".....ab", ".....cd"), 1, 2, 3, 4);
     for (Rect outside : new Rect[] {new Rect(-1, 0, 2, 2), new Rect(5, 0, 8, 1), new Rect(0, 8, 1, 2)}) {
       refuses(IllegalArgumentException.class, () -> toolkit.readArea(outside),
           () -> toolkit.writeArea(outside, new int[99], 0, 8));
@@ -151,20 +151,20 @@ class DrawingTest extends ToolkitTest {
     int a = 0xFF102030;
     int b = 0x80C0D0E0;
     Sprite sprite = sprite(3, 2, a, b, b, a, a, b);
-    List<String> still = List.of("", ".abb", ".aab");
+    List<String> still = List.of("", "..abb", "..aab");
     List<String> turned = List.of("..aa", "..ab", "..bb");
-    Runnable plain = () -> sprite.draw(1, 1, Tint.NONE, BlendMode.REPLACE);
+    Runnable plain = () -> sprite.draw(2, 1, Tint.NONE, BlendMode.REPLACE);
     assertDraws(plain, still, a, b);
-    assertDraws(() -> toolkit.withClip(new Rect(2, 0, 1, 9), plain), List.of("", "..b", "..a"), a, b);
+    assertDraws(() -> toolkit.withClip(new Rect(3, 0, 1, 9), plain), List.of("", "...b", "...a"), a, b);
     assertDraws(() -> sprite.drawScaled(new Rect(1, 0, 6, 4), Tint.NONE, BlendMode.REPLACE),
         List.of(".aabbbb", ".aabbbb", ".aaaabb", ".aaaabb"), a, b);
     assertDraws(() -> sprite.drawScaled(new Rect(0, 0, 0, 0), Tint.NONE, BlendMode.REPLACE), List.of());
-    assertDraws(() -> sprite.drawAcross(1, 1, 4, 1, 1, 3, Tint.NONE, BlendMode.REPLACE), still, a, b);
+    assertDraws(() -> sprite.drawAcross(2, 1, 5, 1, 2, 3, Tint.NONE, BlendMode.REPLACE), still, a, b);
     assertDraws(() -> sprite.drawAcross(4, 0, 4, 3, 2, 0, Tint.NONE, BlendMode.REPLACE), turned, a, b);
     assertDraws(() -> sprite.drawRotated(3, 1.5, Math.PI / 2, 1, Tint.NONE, BlendMode.REPLACE), turned, a, b);
     assertDraws(() -> sprite.drawAcross(1, 1, 1, 1, 1, 3, Tint.NONE, BlendMode.REPLACE), List.of());
-    assertDraws(() -> sprite.drawTiled(new Rect(1, 1, 4, 3), Tint.NONE, BlendMode.REPLACE),
-        List.of("", ".abba", ".aaba", ".abba"), a, b);
+    assertDraws(() -> sprite.drawTiled(new Rect(2, 1, 4, 3), Tint.NONE, BlendMode.REPLACE),
+        List.of("", "..abba", "..aaba", "..abba"), a, b);
 
     int over = channels(s -> (byteAt(a, s) * 255 >> 8) + (byteAt(PAPER, s) >> 8));
     int half = channels(s -> (byteAt(b, s) * 128 >> 8) + (byteAt(PAPER, s) * 128 >> 8));
@@ -175,9 +175,9 @@ class DrawingTest extends ToolkitTest {
 
     toolkit.drawTo(target, toolkit.createDepthBuffer(WIDTH, HEIGHT));
     toolkit.clearDepth();
-    assertDraws(() -> sprite.drawScaled(new Rect(1, 1, 3, 2), 7, Tint.NONE, BlendMode.REPLACE), still, a, b);
+    assertDraws(() -> sprite.drawScaled(new Rect(2, 1, 3, 2), 7, Tint.NONE, BlendMode.REPLACE), still, a, b);
     sprite.setMargins(new Margins(2, 1, 0, 0));
-    assertDraws(plain, List.of("", "", "...abb", "...aab"), a, b);
+    assertDraws(plain, List.of("", "", "....abb", "....aab"), a, b);
     refuses(IllegalArgumentException.class,
         () -> sprite.drawAcross(0, 0, 1, 0, 0, 1, mask, 0, 0, BlendMode.ADD),
         () -> toolkit.createSprite(0, 5).drawTiled(ALL, Tint.NONE, BlendMode.ALPHA));

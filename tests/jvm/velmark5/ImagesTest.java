@@ -57,7 +57,7 @@ class ImagesTest extends ToolkitTest {
     Sprite opaque = toolkit.captureSprite(new Rect(0, 0, 2, 2), true);
     Sprite column = toolkit.captureSprite(new Rect(1, 0, 1, 2), false);
     Sprite part = sprite(2, 2, 7, 7, 7, 7);
-    part.capture(new Rect(1, 1, 1, 1), 1, 0);
+    part.capture(new Rect(0, 1, 1, 1), 1, 0);
     Sprite[] masked = new Sprite[4];
     for (Channel channel : Channel.values()) {
       masked[channel.ordinal()] = sprite(2, 2, 9, 9, 9, 9);
@@ -68,7 +68,7 @@ class ImagesTest extends ToolkitTest {
 
     assertArrayEquals(new int[] {0, 0xFF123456, 0xFF654321, 0xFF000001}, pixels(opaque));
     assertArrayEquals(new int[] {0x00123456, 1}, pixels(column));
-    assertArrayEquals(new int[] {7, 7, 7, 0xFF123456}, pixels(part));
+    assertArrayEquals(new int[] {7, 7, 0xFF123456, 7}, pixels(part));
     assertArrayEquals(new int[] {9, 0x12000009, 0x65000009, 9}, pixels(masked[Channel.RED.ordinal()]));
     assertArrayEquals(new int[] {9, 0x34000009, 0x43000009, 9}, pixels(masked[Channel.GREEN.ordinal()]));
     assertArrayEquals(new int[] {9, 0x56000009, 0x21000009, 0x01000009}, pixels(masked[Channel.BLUE.ordinal()]));
