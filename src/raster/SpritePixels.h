@@ -5,6 +5,7 @@
 // included, and every product is truncated by itself.
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <type_traits>
@@ -218,8 +219,8 @@ Operated(Operation<Op>, Source) -> Operated<Op, Source>;
 // Has the first pixels of a later row brought to the cache. Rows of a target are pages apart, where the processor does
 // not look ahead by itself.
 VELMARK5_LANE void fetch_ahead(const std::uint32_t* row, int n) {
-  constexpr int line = 16;
-  for (int i = 0; i < n && i < 16 * line; i += line) _mm_prefetch(reinterpret_cast<const char*>(row + i), _MM_HINT_T0);
+  const std::uint32_t* const end = row + std::min(n, 256);
+  for (; row < end; row += 16) _mm_prefetch(reinterpret_cast<const char*>(row), _MM_HINT_T0);
 }
 
 // Draws n pixels to `to`, and the same to the rows after it.

@@ -120,16 +120,27 @@ void ScaledRows::fetch() {
   current = 0;
 
   const auto inside = [&](int r) { return from[r] >= 0 && lowest >= 0 && from[r] + highest <= last; };
+  const std::uint32_t* rows[batch];
   const std::uint32_t* some = nullptr;
-  for (int r = 0; r < count; ++r) some = inside(r) ? sprite.pixels + from[r] : some;
+  int outside = 0;
+  for (int r = 0; r < count; ++r) {
+    rows[r] = nullptr;
+    if (inside(r)) {
+      rows[r] = some = sprite.pixels + from[r];
+    } else {
+      ++outside;
+    }
+  }
   if (some != nullptr) {
     // Always a whole batch, though some of it may be of no use.
-    const std::uint32_t* rows[batch];
-    for (int r = 0; r < batch; ++r) rows[r] = r < count && inside(r) ? sprite.pixels + from[r] : some;
+    for (int r = 0; r < batch; ++r) {
+      if (r >= count || rows[r] == nullptr) rows[r] = some;
+    }
     fetch_groups(rows);
   }
-  for (int r = 0; r < count; ++r) {
+  for (int r = 0; outside > 0; ++r) {
     if (inside(r)) continue;
+    --outside;
     // Steps that add up past the image's last pixel take that pixel.
     for (int i = 0; i < strip_width; ++i) fetched[r][i] = sprite.pixels[std::clamp<i64>(from[r] + column[i], 0, last)];
   }
