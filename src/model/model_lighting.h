@@ -59,7 +59,9 @@ class sun {
   // sun_intensity of three normals at once.
   VELMARK5_LANE SSEMath::Int4 intensities(const corner_vectors& normals, SSEMath::Float4 contrastfactor) const {
     using namespace SSEMath;
-    const Float4 d{_mm_div_ps((x_ * normals.x + y_ * normals.y + z_ * normals.z).v, normals.w.v)};
+    Float4 d = x_ * normals.x + y_ * normals.y + z_ * normals.z;
+    // Only merged normals are sums.
+    if (lane_bits(equal(normals.w, splat(1.0f))) != 15) d = {_mm_div_ps(d.v, normals.w.v)};
     const Float4 side = select(less(splat(0.0f), d), front_, back_);
     return truncate((ambient_ + d * side * contrastfactor) * splat(256.0f));
   }
