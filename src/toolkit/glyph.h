@@ -253,7 +253,7 @@ class turned_tile {
   static constexpr int columns = 64, rows = 16;  // on the screen
 
   // From screen column `column` and row `row` of the turned glyph on, w by h.
-  turned_tile(const bitmap& glyph, int column, int row, int w, int h) {
+  [[gnu::noinline]] turned_tile(const bitmap& glyph, int column, int row, int w, int h) {
     if (glyph.width < 8 || glyph.height < 8) {
       for (int j = 0; j < h; ++j) {
         for (int i = 0; i < w; ++i) *place(i, j) = *source(glyph, column + i, row + j);
