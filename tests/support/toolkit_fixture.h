@@ -118,10 +118,10 @@ class toolkit_fixture : public testing::Test {
     }
   }
 
-  // A span mask in the pool, with the same width and height for all.
+  // A span mask in the pool, 40 by 30 as far as sprites are concerned.
   jobject new_mask(const std::vector<jint>& starts, const std::vector<jint>& lengths) {
     const jobject mask = java.new_object("wa");
-    Java_wa_l(env, mask, 0, pool_peer, 40, 40, java.new_ints(starts), java.new_ints(lengths));
+    Java_wa_l(env, mask, 0, pool_peer, 40, 30, java.new_ints(starts), java.new_ints(lengths));
     return mask;
   }
 

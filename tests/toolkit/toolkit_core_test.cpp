@@ -134,7 +134,7 @@ TEST_F(toolkit_core, keeps_a_ring_of_thread_resources) {
 TEST_F(toolkit_core, span_masks_copy_both_arrays_into_the_pool) {
   const jobject mask_peer = new_mask({5, -6, 7}, {1, 0, -2, 9});
   const auto& mask = *native<clippingmask>(mask_peer);
-  EXPECT_TRUE(mask.width == 40 && mask.height == 40 && mask.rows() == 3);
+  EXPECT_TRUE(mask.width == 40 && mask.height == 30 && mask.rows() == 3);
   EXPECT_TRUE(mask.starts[0] == 5 && mask.starts[1] == -6 && mask.starts[2] == 7);
   EXPECT_TRUE(mask.lengths.count() == 4 && mask.lengths[2] == -2 && mask.lengths[3] == 9);
   EXPECT_TRUE(mask.starts.manager == &pool() && mask.lengths.manager == &pool());
