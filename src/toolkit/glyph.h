@@ -291,8 +291,9 @@ class turned_tile {
     const __m128i ab_left = _mm_unpacklo_epi16(a, b), ab_right = _mm_unpackhi_epi16(a, b);
     const __m128i cd_left = _mm_unpacklo_epi16(c, d), cd_right = _mm_unpackhi_epi16(c, d);
     const auto put = [&](int lower, __m128i two) {
-      _mm_storel_pd(reinterpret_cast<double*>(to + lower * step), _mm_castsi128_pd(two));
-      _mm_storeh_pd(reinterpret_cast<double*>(to + (lower - 1) * step), _mm_castsi128_pd(two));
+      // Bytes lie anywhere, which the stores of doubles do not allow for.
+      _mm_storel_epi64(reinterpret_cast<__m128i*>(to + lower * step), two);
+      _mm_storeh_pi(reinterpret_cast<__m64*>(to + (lower - 1) * step), _mm_castsi128_ps(two));
     };
     put(7, _mm_unpacklo_epi32(ab_left, cd_left));
     put(5, _mm_unpackhi_epi32(ab_left, cd_left));
