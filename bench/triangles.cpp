@@ -12,6 +12,7 @@
 #include "raster/Rasterizer.h"
 #include "raster/Triangle.h"
 #include "triangle_scene.h"
+#include "util/memorymanager/alignedmemory.h"
 
 namespace {
 
@@ -48,9 +49,6 @@ class scene {
     for (const auto& t : triangle_scene::make(size, what == kind::textured_translucent)) {
       for (const auto& v : t) vertices_.push_back({{v.x, v.y, v.z, 1}, {v.u, v.v, 0, 0}, v.colour});
     }
-    // Whole cache lines, as a canvas has them.
-    colour_ = aligned(colour_memory_);
-    depth_ = aligned(depth_memory_);
     for (int i = 0; i < 3; ++i) {
       for (int v = 0; v < 128; ++v) {
         for (int u = 0; u < 128; ++u) textures_[i][u + 256 * v] = triangle_scene::texel(i, u, v);
@@ -59,8 +57,8 @@ class scene {
     for (int v = 0; v < 128; ++v) {
       for (int u = 0; u < 128; ++u) light_map_[static_cast<std::size_t>(u + 256 * v)] = triangle_scene::light(u, v);
     }
-    m_pColourBuffer = colour_;
-    m_pDepthBuffer = depth_;
+    m_pColourBuffer = colour_.get();
+    m_pDepthBuffer = depth_.get();
     m_ScreenPitch = triangle_scene::width;
     SetViewport({0, 0, triangle_scene::width, triangle_scene::height, 0, 1});
     SetCliprect({0, 0, triangle_scene::width, triangle_scene::height});
@@ -68,8 +66,8 @@ class scene {
   }
 
   void clear() {
-    std::fill_n(colour_, pixels, 0u);
-    std::fill_n(depth_, pixels, far_depth);
+    std::fill_n(colour_.get(), pixels, 0u);
+    std::fill_n(depth_.get(), pixels, far_depth);
   }
 
   // Makes a Triangle_s of each triangle's vertices, as a mesh renderer does, and draws it.
@@ -97,16 +95,21 @@ class scene {
   long covered() {
     clear();
     draw(triangle_scene::sparse_step(size_, count()));
-    return static_cast<long>(pixels) - std::count(depth_, depth_ + pixels, far_depth);
+    return static_cast<long>(pixels) - std::count(depth_.get(), depth_.get() + pixels, far_depth);
   }
 
   static constexpr std::size_t pixels = std::size_t{triangle_scene::width} * triangle_scene::height;
 
  private:
+  struct release {
+    void operator()(void* memory) const { _aligned_free(memory); }
+  };
+  // As images and canvases get theirs.
   template <class T>
-  static T* aligned(std::vector<T>& memory) {
-    memory.resize(pixels + 16);
-    return reinterpret_cast<T*>((reinterpret_cast<std::uintptr_t>(memory.data()) + 63) & ~std::uintptr_t{63});
+  using buffer = std::unique_ptr<T[], release>;
+  template <class T>
+  static buffer<T> make_buffer() {
+    return buffer<T>(static_cast<T*>(_aligned_malloc(pixels * sizeof(T), 64)));
   }
 
   // A vertex as the renderers keep it after projection.
@@ -118,10 +121,8 @@ class scene {
   kind what_;
   int size_;
   std::vector<vertex> vertices_;  // three of each triangle
-  std::vector<unsigned int> colour_memory_;
-  std::vector<float> depth_memory_;
-  unsigned int* colour_;
-  float* depth_;
+  buffer<unsigned int> colour_ = make_buffer<unsigned int>();
+  buffer<float> depth_ = make_buffer<float>();
   std::vector<std::uint32_t> textures_[3] = {std::vector<std::uint32_t>(256 * 128),
                                              std::vector<std::uint32_t>(256 * 128),
                                              std::vector<std::uint32_t>(256 * 128)};
