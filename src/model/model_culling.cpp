@@ -26,8 +26,13 @@ struct points {
 
 // Points i to i + 3; past the end, the last point again.
 VELMARK5_LANE points points_at(const Vector4_s* positions, int i, int count) {
-  const auto point = [=](int k) { return load(&positions[std::min(i + k, count - 1)].x); };
-  const Float4 p0 = load(&positions[i].x), p1 = point(1), p2 = point(2), p3 = point(3);
+  const Vector4_s* from = positions + i;
+  Vector4_s last[group];
+  if (count - i < group) {
+    for (int k = 0; k < group; ++k) last[k] = positions[std::min(i + k, count - 1)];
+    from = last;
+  }
+  const Float4 p0 = load(&from[0].x), p1 = load(&from[1].x), p2 = load(&from[2].x), p3 = load(&from[3].x);
   const Float4 xy01 = interleave_low(p0, p1), xy23 = interleave_low(p2, p3);
   return {low_pairs(xy01, xy23), high_pairs(xy01, xy23), low_pairs(interleave_high(p0, p1), interleave_high(p2, p3))};
 }
