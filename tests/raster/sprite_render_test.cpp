@@ -137,6 +137,16 @@ TEST_F(sprite_render, wide_scaled_sprites_equal_the_reference) {
   record("sprite_scaled_wide");
 }
 
+// Of 507 rows over 8500 the steps' roundings add up past the last row: that takes the image's last pixel.
+TEST_F(sprite_render, steps_that_add_up_past_the_image_take_its_last_pixel) {
+  test_random random(51);
+  random_target(random, 8, 8500, false);
+  kit().setclipping(0, 0, 8, 8500);
+  expect_target();
+  random_sprite(random, 5, 507, false);
+  ASSERT_TRUE(same_after(scaled, {.w = 8, .h = 8500}));
+}
+
 // Half of an odd size loses half a texel, which the pixel's centre makes up for in this direction.
 TEST_F(sprite_render, a_parallelogram_of_the_images_size_draws_it_unchanged) {
   for (int size = 1; size < 40; ++size) {
