@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "raster/Sprite.h"
 #include "reference/comparison.h"
@@ -99,11 +100,18 @@ class sprite_scene : public toolkit_fixture {
     if (!std::equal(image.pixels.begin(), image.pixels.end(), sprite->pixels)) {
       return testing::AssertionFailure() << "the sprite was written";
     }
+    hashes.push_back(hash_of(colour));
     const auto same_depth = same_image(depth, expected.depth.data());
     return same_depth ? same_image(colour, expected.colour.data()) : same_depth;
   }
 
-  void record(const std::string& name) { frame_record::add(name.c_str(), colour.data(), colour.elements()); }
+  // All frames since the last record.
+  void record(const std::string& name) {
+    frame_record::add(name.c_str(), hashes.data(), hashes.size());
+    hashes.clear();
+  }
+
+  std::vector<std::uint32_t> hashes;
 
   void TearDown() override {
     Java_wa_ma(env, mask_peer);
