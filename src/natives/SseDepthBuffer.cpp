@@ -19,8 +19,9 @@ VELMARK5_NATIVE(void) Java_oa_za(JNIEnv* env, jobject peer, jlong handle) {
     const auto* const image = from_optional_handle<DepthBuffer_c>(handle);
     if (image != nullptr) {
       forget_target(nullptr, image->depth);
-      if (toolkit* t = toolkit::live_instance; t != nullptr && t->offscreen_depth == image)
+      if (toolkit* t = toolkit::live_instance; t != nullptr && t->offscreen_depth == image) {
         t->offscreen_depth = nullptr;
+      }
       delete image;
     }
     objconvert::set_depthbuffer(env, peer, nullptr);

@@ -106,8 +106,9 @@ VELMARK5_NATIVE(void) Java_fa_M(JNIEnv* env, jobject peer, jlong handle) {
     const auto* const sprite = from_optional_handle<Sprite_c>(handle);
     if (sprite != nullptr) {
       forget_target(sprite->pixels, nullptr);
-      if (toolkit* t = toolkit::live_instance; t != nullptr && t->offscreen_sprite == sprite)
+      if (toolkit* t = toolkit::live_instance; t != nullptr && t->offscreen_sprite == sprite) {
         t->offscreen_sprite = nullptr;
+      }
       delete sprite;
     }
     objconvert::set_sprite(env, peer, nullptr);

@@ -56,12 +56,12 @@ VELMARK5_LANE bool edges_meet(SSEMath::Float4 edge) {
 }
 
 // Brings the first rows below a pixel of a target into the cache, while the setup goes on. The pixel may lie anywhere:
-// addresses are integers here.
+// addresses are integers here, and wrap.
 VELMARK5_LANE void prefetch_rows(const void* target, int x, int y) {
-  const std::ptrdiff_t row_bytes = std::ptrdiff_t{m_ScreenPitch} * 4;
-  auto address = reinterpret_cast<std::uintptr_t>(target) + static_cast<std::uintptr_t>(y * row_bytes) +
-                 4 * static_cast<std::uintptr_t>(std::ptrdiff_t{x});
-  for (int i = 0; i < 4; ++i, address += static_cast<std::uintptr_t>(row_bytes)) {
+  const auto wrapping = [](int n) { return static_cast<std::uintptr_t>(std::intptr_t{n}); };
+  const std::uintptr_t row_bytes = wrapping(m_ScreenPitch) * 4;
+  auto address = reinterpret_cast<std::uintptr_t>(target) + wrapping(y) * row_bytes + wrapping(x) * 4;
+  for (int i = 0; i < 4; ++i, address += row_bytes) {
     SSEMath::prefetch_nearest(reinterpret_cast<const void*>(address));
   }
 }
