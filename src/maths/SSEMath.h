@@ -53,6 +53,7 @@ VELMARK5_LANE Float4& operator+=(Float4& a, Float4 b) { return a = a + b; }
 // max and min take the second operand when either is not a number, as the instructions do.
 VELMARK5_LANE Float4 max(Float4 a, Float4 b) { return {_mm_max_ps(a.v, b.v)}; }
 VELMARK5_LANE Float4 min(Float4 a, Float4 b) { return {_mm_min_ps(a.v, b.v)}; }
+VELMARK5_LANE Float4 magnitude(Float4 a) { return {_mm_andnot_ps(_mm_set1_ps(-0.0f), a.v)}; }
 VELMARK5_LANE Float4 reciprocal_estimate(Float4 a) { return {_mm_rcp_ps(a.v)}; }
 VELMARK5_LANE Float4 reciprocal_root_estimate(Float4 a) { return {_mm_rsqrt_ps(a.v)}; }
 VELMARK5_LANE Int4 less(Float4 a, Float4 b) { return {_mm_castps_si128(_mm_cmplt_ps(a.v, b.v))}; }
@@ -73,6 +74,12 @@ template <int Lane>
 VELMARK5_LANE Float4 broadcast(Float4 a) {
   return shuffle<Lane, Lane, Lane, Lane>(a);
 }
+// Lanes 0 and 1, or 2 and 3, of a, then the same of b.
+VELMARK5_LANE Float4 low_pairs(Float4 a, Float4 b) { return {_mm_movelh_ps(a.v, b.v)}; }
+VELMARK5_LANE Float4 high_pairs(Float4 a, Float4 b) { return {_mm_movehl_ps(b.v, a.v)}; }
+// a0, b0, a1, b1; and a2, b2, a3, b3.
+VELMARK5_LANE Float4 interleave_low(Float4 a, Float4 b) { return {_mm_unpacklo_ps(a.v, b.v)}; }
+VELMARK5_LANE Float4 interleave_high(Float4 a, Float4 b) { return {_mm_unpackhi_ps(a.v, b.v)}; }
 VELMARK5_LANE float lane0(Float4 a) { return _mm_cvtss_f32(a.v); }
 VELMARK5_LANE Float4 select(Int4 mask, Float4 set, Float4 clear) {
   const __m128 m = _mm_castsi128_ps(mask.v);

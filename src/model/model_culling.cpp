@@ -14,11 +14,6 @@ using namespace SSEMath;
 constexpr int group = 4;
 static_assert(threadresource::max_vertices % group == 0, "the last group is written whole");
 
-VELMARK5_LANE Float4 low_pairs(Float4 p, Float4 q) { return {_mm_movelh_ps(p.v, q.v)}; }
-VELMARK5_LANE Float4 high_pairs(Float4 p, Float4 q) { return {_mm_movehl_ps(q.v, p.v)}; }
-VELMARK5_LANE Float4 interleave_low(Float4 p, Float4 q) { return {_mm_unpacklo_ps(p.v, q.v)}; }
-VELMARK5_LANE Float4 interleave_high(Float4 p, Float4 q) { return {_mm_unpackhi_ps(p.v, q.v)}; }
-
 // Four points by coordinate.
 struct points {
   Float4 x, y, z;

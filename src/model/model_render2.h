@@ -10,6 +10,7 @@
 #include "model/model.h"
 #include "model/model_culling.h"
 #include "model/model_lighting.h"
+#include "raster/Occlusion.h"
 #include "raster/Rasterizer.h"
 #include "raster/Triangle.h"
 #include "texture/texturecache.h"
@@ -148,19 +149,21 @@ class face_drawer {
     } else {
       if (HEIGHTFOG && !fog_corners(a, b, c)) return;
       const cachedtexture* const texture = texture_of(f);
+      const bool textured = texture != nullptr && texture->texels != nullptr;
+      const bool translucent = transparency != 0;
+      if (textured && (translucent || texture->alpha_kind == blending_texture)) mesh.hasalpha = true;
+      if (DEPTH && IsHidden(triangle)) return;
       if (type > FT_FLAT || (texture != nullptr && texture->lighting_kind == unlit_material)) {
         set_colours(SSEMath::widen_shifted(colours_of(f)));
       } else {
         light_face(f, type == FT_SMOOTH, a, b, c);
       }
       triangle.alpha = (255u - transparency) * 0x10001u;
-      const bool translucent = transparency != 0;
-      if (texture == nullptr || texture->texels == nullptr) {
+      if (!textured) {
         draw_untextured(translucent);
         return;
       }
       place_texture(f);
-      if (translucent || texture->alpha_kind == blending_texture) mesh.hasalpha = true;
       (translucent ? translucent_instance : opaque_instance)(triangle);
     }
   }

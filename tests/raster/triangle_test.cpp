@@ -8,6 +8,7 @@
 #include <thread>
 #include <vector>
 
+#include "raster/Occlusion.h"
 #include "raster/Rasterizer.h"
 #include "raster/triangle_instances.h"
 #include "reference/comparison.h"
@@ -328,6 +329,83 @@ TEST_F(TriangleTest, RowsAndSpansEndWhereTheyShould) {
   EXPECT_EQ(drawn(triangle(32, 0, 32, 0, 24, 4)), "1: 30 + 2; 2: 28 + 4; 3: 26 + 6; ")
       << "of two tops at one place the short edge is taken as the right one, and carries on";
   EXPECT_EQ(drawn(triangle(32, 0, 32, 0, 40, 4)), "");
+}
+
+// --- Hidden triangles -----------------------------------------------------------------------------------------------
+
+// Up to 40 pixels large, with slivers, whole and half coordinates, common rows and columns, and edges and depths that
+// hardly change.
+Triangle_s small_triangle(test_random& random, float x, float y) {
+  const float sizes[] = {1, 3, 8, 16, 31, 40};
+  const float size = sizes[random.between(0, 5)], depth = std::ldexp(1.0f, -random.between(0, 12));
+  Triangle_s t{};
+  for (VertexColour_s& colour : t.colour) std::fill_n(colour.channels, 4, std::uint16_t{0xFFFF});
+  for (Vector4_s& v : t.vertex) {
+    v = {x + random.real(0, size), y + random.real(0, size), random.one_in(3) ? depth : random.real(0, depth), 1};
+  }
+  const Vector4_s &a = t.vertex[0], &b = t.vertex[2];
+  Vector4_s& moved = t.vertex[random.between(0, 2)];
+  const auto about = [&random](float middle, float by) { return middle + random.real(-by, by); };
+  if (random.one_in(4)) moved.z = about(a.z, 1e-5f * depth);
+  const int special = random.between(0, 12);
+  if (special <= 2) moved.x = about((a.x + b.x) / 2, 0.1f), moved.y = about((a.y + b.y) / 2, 0.1f);
+  if (special == 3 || special == 4) moved.y = a.y;
+  if (special == 5) moved.x = about(a.x, 0.01f), moved.y = about(a.y, 0.5f);
+  if (special == 7) moved.x = about(a.x, 0.2f);
+  for (Vector4_s& v : t.vertex) {
+    if (special == 4 || special == 6) v.x = std::round(v.x * 2) / 2, v.y = std::round(v.y * 2) / 2;
+    if (special == 8) v.y = about(std::round(v.y), 0.02f);
+  }
+  return t;
+}
+
+// The strictest background: just in front of the nearest vertex, and only where the triangle can have pixels, so that
+// one pixel outside or one depth that falls too low shows; also with a hole of one pixel, and two pixels larger.
+TEST_F(TriangleTest, HiddenTrianglesDrawNothing) {
+  constexpr int columns = 65536, rows = 64;
+  target = {columns, rows};
+  target.depth.fill(far_depth);
+  target.select(smooth);
+  SetViewport({0, 0, columns, rows, 0, 1});
+  SetCliprect({0, 0, columns, rows});
+  test_random random(3);
+  int hidden[3] = {}, all = 0;
+  for (int n = 0; n < 100000; ++n) {
+    const float places[] = {-4, 30, 65510, random.real(0, columns)};
+    const Triangle_s t = small_triangle(random, places[random.between(0, 3)], random.real(-4, 30));
+    const Vector4_s* const v = t.vertex;
+    const auto [left, right] = std::minmax({v[0].x, v[1].x, v[2].x});
+    const auto [top, bottom] = std::minmax({v[0].y, v[1].y, v[2].y});
+    const auto [nearest, farthest] = std::minmax({v[0].z, v[1].z, v[2].z});
+    for (int way = 0; way < 3; ++way) {
+      const int margin = way == 2 ? 2 : 0;
+      const auto at = [](float f, int by, int end) { return std::clamp(static_cast<int>(f) + by, 0, end); };
+      const int x0 = at(std::nearbyint(left), -margin, columns), x1 = at(std::nearbyint(right), margin, columns);
+      const int y0 = at(top, -margin, rows), y1 = at(bottom, margin, rows);
+      if (x0 >= x1 || y0 >= y1) continue;
+      const auto fill = [&](float value) {
+        for (int y = y0; y < y1; ++y) std::fill_n(&target.depth.at(x0, y), x1 - x0, value);
+      };
+      fill(random.one_in(4) ? std::nextafter(nearest, -1.0f) : nearest - 1.1e-5f * farthest);
+      if (way == 1) target.depth.at(random.between(x0, x1 - 1), random.between(y0, y1 - 1)) = far_depth;
+      if (IsHidden(t)) {
+        ++hidden[way];
+        render(smooth, t);
+        const int end = std::min(columns, x1 + 8);
+        for (int y = 0; y < rows; ++y) {
+          const auto* const row = &target.colour.at(0, y);
+          const auto* const drawn =
+              std::find_if(row + std::max(0, x0 - 8), row + end, [](auto word) { return word != 0; });
+          ASSERT_EQ(drawn, row + end) << "triangle " << n << " in row " << y;
+        }
+      }
+      fill(far_depth);
+    }
+    const float area = (v[1].x - v[0].x) * (v[2].y - v[0].y) - (v[2].x - v[0].x) * (v[1].y - v[0].y);
+    all += std::abs(area) > 12 && right - left < 32 && bottom - top < 32 && left > 0 && right < columns && top > 0;
+  }
+  EXPECT_GT(hidden[0], 0.1 * all);
+  EXPECT_GT(hidden[2], 0.7 * all) << "three in four backgrounds are near enough";
 }
 
 // --- Threads --------------------------------------------------------------------------------------------------------
