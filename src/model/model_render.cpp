@@ -66,14 +66,18 @@ void model::render(threadresource& resource, const Matrix_c& world_matrix, copie
   const Vector4_s screen0 = stored(Rasterizer_n::ToScreen(Rasterizer_n::Transform(modelviewprojection, 0, low, 0)));
   const Vector4_s screen1 = stored(Rasterizer_n::ToScreen(Rasterizer_n::Transform(modelviewprojection, 0, high, 0)));
   const float maxdepth = std::max(screen0.z, screen1.z);
+  const bool first_deeper = world0.z > world1.z;
+  const int half_width =
+      screen_radius(scene, first_deeper ? world0 : world1, first_deeper ? screen0.x : screen1.x, radius);
+  const auto half = static_cast<float>(half_width);
+  Rasterizer_n::PrefetchDepth(std::min(screen0.x, screen1.x) - half, std::min(screen0.y, screen1.y),
+                              std::max(screen0.x, screen1.x) + half, std::max(screen0.y, screen1.y));
   if (result.elements != nullptr) {
-    const bool first_deeper = world0.z > world1.z;
     result.elements[0] = truncated(screen0.x);
     result.elements[1] = truncated(screen0.y);
     result.elements[2] = truncated(screen1.x);
     result.elements[3] = truncated(screen1.y);
-    result.elements[4] =
-        screen_radius(scene, first_deeper ? world0 : world1, first_deeper ? screen0.x : screen1.x, radius);
+    result.elements[4] = half_width;
     result.elements[5] = 1;
   }
 

@@ -3,6 +3,8 @@
 #include <emmintrin.h>
 
 #include <algorithm>
+#include <cstddef>
+#include <cstdint>
 
 #include "maths/SSEMath.h"
 
@@ -77,6 +79,20 @@ void SetZWrite(bool enable) { m_ZWriteEnabled = enable; }
 Vector4_s FogColour(unsigned int colour) {
   const auto channel = [colour](int byte) { return static_cast<float>(colour >> (8 * byte) & 0xFF) * 256.0f; };
   return {channel(0), channel(1), channel(2), channel(3)};
+}
+
+void PrefetchDepth(float left, float top, float right, float bottom) {
+  constexpr int line = 64 / sizeof(float), largest = 1 << 14;  // pixels
+  using namespace SSEMath;
+  if (m_pDepthBuffer == nullptr) return;
+  const int x0 = std::max(truncate(left), m_ClipBox.left), x1 = std::min(truncate(right), m_ClipBox.right);
+  const int y0 = std::max(truncate(top), m_ClipBox.top), y1 = std::min(truncate(bottom), m_ClipBox.bottom);
+  if (x0 >= x1 || y0 >= y1 || (std::int64_t{x1} - x0) * (std::int64_t{y1} - y0) > largest) return;
+  const float* row = m_pDepthBuffer + std::ptrdiff_t{y0} * m_ScreenPitch;
+  for (int y = y0; y < y1; ++y, row += m_ScreenPitch) {
+    for (int x = x0; x < x1; x += line) prefetch_nearer(row + x);
+    prefetch_nearer(row + x1 - 1);
+  }
 }
 
 }  // namespace Rasterizer_n
