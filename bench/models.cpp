@@ -1,7 +1,8 @@
 // Models: single ones by size, drawn and culled in both ways, and a scene of 500, beside llvmpipe on the same
 // triangles.
 //
-// A frame of the scene is clearing colour and depth, and 500 models of 300 faces, sunlit, textured and depth-tested.
+// A frame of the scene is clearing colour and depth, and 500 models of 300 faces, sunlit, textured and depth-tested:
+// the nearest first, as who draws with a depth test orders them, or in any order.
 // Times are processor time of the drawing thread, but those named wall. Compare medians of one run:
 //   velmark5_bench --benchmark_filter=models --benchmark_repetitions=9 --benchmark_enable_random_interleaving=true
 #include <benchmark/benchmark.h>
@@ -15,6 +16,7 @@
 #include <memory>
 #include <string>
 #include <thread>
+#include <tuple>
 #include <vector>
 
 #include "bench_toolkit.h"
@@ -347,19 +349,24 @@ void single_models(benchmark::State& state, model_size size, fate what) {
 
 // --- The scene of models --------------------------------------------------------------------------------------------
 
-// 500 balls of 300 faces anywhere in view, the left half of them first.
+enum class order { nearest_first, any };
+
+void nearest_first(std::vector<placed_model>& list) {
+  std::sort(list.begin(), list.end(),
+            [](const placed_model& p, const placed_model& q) { return p.world.rows[3].z < q.world.rows[3].z; });
+}
+
+// 500 balls of 300 faces anywhere in view.
 class models_scene : public stage {
  public:
-  models_scene() {
+  explicit models_scene(order drawn) {
     test_random random(500);
     for (int i = 0; i < 500; ++i) {
       model& m = add(ball(15, 11, 60, random));
       const double z = random.real(600, 3000);
       list.push_back({&m, placed_at(random.real(-0.93f, 0.93f) * z, random.real(-0.52f, 0.52f) * z, z)});
     }
-    const auto side = [](const placed_model& p) { return p.world.rows[3].x / p.world.rows[3].z; };
-    std::nth_element(list.begin(), list.begin() + 250, list.end(),
-                     [&](const placed_model& p, const placed_model& q) { return side(p) < side(q); });
+    if (drawn == order::nearest_first) nearest_first(list);
     frame_here();  // what is computed at the first draw
   }
 
@@ -416,8 +423,8 @@ void report_frames(benchmark::State& state, double wall) {
 }
 
 // Four lights among the models, or none.
-void scene_here(benchmark::State& state, bool point_lit) {
-  models_scene s;
+void scene_here(benchmark::State& state, order drawn, bool point_lit) {
+  models_scene s(drawn);
   if (point_lit) {
     // x, y, z, range, colour.
     const int lights[4][5] = {{-500, -200, 900, 800, 0xFFC080},
@@ -440,10 +447,15 @@ void scene_here(benchmark::State& state, bool point_lit) {
 // Two workers draw the left and the right half of the models. The frame takes as long as the busier of them and the
 // clearing before.
 void scene_by_two(benchmark::State& state) {
-  models_scene s;
+  models_scene s(order::any);
   const auto helper_scratch = std::make_unique<threadresource>(*toolkit::m_pInstance, 0, 0);
-  const std::vector<placed_model> left(s.list.begin(), s.list.begin() + 250);
-  const std::vector<placed_model> right(s.list.begin() + 250, s.list.end());
+  const auto side = [](const placed_model& p) { return p.world.rows[3].x / p.world.rows[3].z; };
+  const auto middle = s.list.begin() + 250;
+  std::nth_element(s.list.begin(), middle, s.list.end(),
+                   [&](const placed_model& p, const placed_model& q) { return side(p) < side(q); });
+  std::vector<placed_model> left(s.list.begin(), middle), right(middle, s.list.end());
+  nearest_first(left);
+  nearest_first(right);
   std::barrier meeting(2);
   bool stop = false;
   double helper_time = 0;
@@ -484,12 +496,12 @@ void scene_by_two(benchmark::State& state) {
 }
 
 // threads: 0 to draw on the calling thread.
-void scene_with_mesa(benchmark::State& state, int vector_width, int threads) {
-  static std::map<std::pair<int, int>, std::unique_ptr<mesa_peer>> peers;
-  auto& mesa = peers[{vector_width, threads}];
+void scene_with_mesa(benchmark::State& state, order drawn, int vector_width, int threads) {
+  static std::map<std::tuple<order, int, int>, std::unique_ptr<mesa_peer>> peers;
+  auto& mesa = peers[{drawn, vector_width, threads}];
   long ours = 0;
   {
-    models_scene s;
+    models_scene s(drawn);
     ours = s.covered();
     if (mesa == nullptr) {
       const model_scene::scene scene = s.for_peer();
@@ -526,17 +538,22 @@ const bool registered = [] {
     add(
         name + "/out_of_view", [=](benchmark::State& s) { single_models(s, size, fate::out_of_view); }, 20);
   }
-  add(
-      "scene/velmark5", [](benchmark::State& s) { scene_here(s, false); }, 10);
-  add(
-      "scene/velmark5_four_lights", [](benchmark::State& s) { scene_here(s, true); }, 10);
-  add("scene/velmark5_two_threads", scene_by_two, 10);
-  for (const int bits : {128, 256}) {
+  constexpr auto sorted = order::nearest_first;
+  for (const order drawn : {sorted, order::any}) {
+    const std::string scene = drawn == sorted ? "scene/" : "scene_in_any_order/";
     add(
-        "scene/llvmpipe" + std::to_string(bits), [=](benchmark::State& s) { scene_with_mesa(s, bits, 0); }, 4);
+        scene + "velmark5", [=](benchmark::State& s) { scene_here(s, drawn, false); }, 10);
+    for (const int bits : {128, 256}) {
+      add(
+          scene + "llvmpipe" + std::to_string(bits), [=](benchmark::State& s) { scene_with_mesa(s, drawn, bits, 0); },
+          4);
+    }
   }
   add(
-      "scene/llvmpipe256_two_threads", [](benchmark::State& s) { scene_with_mesa(s, 256, 2); }, 4);
+      "scene/velmark5_four_lights", [](benchmark::State& s) { scene_here(s, sorted, true); }, 10);
+  add("scene/velmark5_two_threads", scene_by_two, 10);
+  add(
+      "scene/llvmpipe256_two_threads", [](benchmark::State& s) { scene_with_mesa(s, sorted, 256, 2); }, 4);
   return true;
 }();
 
