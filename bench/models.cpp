@@ -542,7 +542,7 @@ const bool registered = [] {
   for (const order drawn : {sorted, order::any}) {
     const std::string scene = drawn == sorted ? "scene/" : "scene_in_any_order/";
     add(
-        scene + "velmark5", [=](benchmark::State& s) { scene_here(s, drawn, false); }, 10);
+        scene + "velmark5", [=](benchmark::State& s) { scene_here(s, drawn, false); }, 40);
     for (const int bits : {128, 256}) {
       add(
           scene + "llvmpipe" + std::to_string(bits), [=](benchmark::State& s) { scene_with_mesa(s, drawn, bits, 0); },
@@ -550,10 +550,10 @@ const bool registered = [] {
     }
   }
   add(
-      "scene/velmark5_four_lights", [](benchmark::State& s) { scene_here(s, sorted, true); }, 10);
-  add("scene/velmark5_two_threads", scene_by_two, 10);
+      "scene/velmark5_four_lights", [](benchmark::State& s) { scene_here(s, sorted, true); }, 40);
+  add("scene/velmark5_two_threads", scene_by_two, 40);
   add(
-      "scene/llvmpipe256_two_threads", [](benchmark::State& s) { scene_with_mesa(s, sorted, 256, 2); }, 4);
+      "scene/llvmpipe256_two_threads", [](benchmark::State& s) { scene_with_mesa(s, sorted, 256, 2); }, 10);
   return true;
 }();
 
