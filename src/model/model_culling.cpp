@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "raster/Occlusion.h"
 #include "raster/Projection.h"
 
 namespace culling {
@@ -148,12 +149,16 @@ VELMARK5_LANE std::uint32_t one_within(const corners& faces, int f, const thread
   return (flags[faces.a[f]] & flags[faces.b[f]] & flags[faces.c[f]]) == Rasterizer_n::CullFlagsVisible ? 1 : 0;
 }
 
+bool within_view(flag_summary flags) {
+  constexpr int wanted = Rasterizer_n::CullFlagsVisible;
+  return flags.any == wanted && flags.all == wanted;
+}
+
 }  // namespace
 
 void find_visible(const corners& faces, int count, const threadresource& projected, flag_summary flags,
                   face_set& visible) {
-  constexpr int wanted = Rasterizer_n::CullFlagsVisible;
-  const bool all_within = flags.any == wanted && flags.all == wanted;
+  const bool all_within = within_view(flags);
   for (int first = 0; first < count; first += face_set::word_bits) {
     const int here = std::min(face_set::word_bits, count - first);
     std::uint32_t bits = 0;
@@ -167,6 +172,20 @@ void find_visible(const corners& faces, int count, const threadresource& project
     }
     visible.word_of(first) = bits;
   }
+}
+
+bool is_covered(int count, const threadresource& projected, flag_summary flags) {
+  if (!within_view(flags) || count == 0) return false;
+  const Vector4_s* const vertices = projected.vertices;
+  Float4 low = load(&vertices[0].x), high = low;
+  for (int i = 1; i < count; ++i) {
+    const Float4 v = load(&vertices[i].x);
+    low = min(low, v), high = max(high, v);
+  }
+  Rasterizer_n::ScreenBox_s box;
+  store(&box.low.x, low);
+  store(&box.high.x, high);
+  return Rasterizer_n::IsCovered(box);
 }
 
 }  // namespace culling

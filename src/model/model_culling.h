@@ -54,4 +54,7 @@ struct corners {
 void find_visible(const corners& faces, int count, const threadresource& projected, flag_summary flags,
                   face_set& visible);
 
+// Whether the box of the vertices lies behind what is drawn already. Models that reach out of view are not looked at.
+bool is_covered(int count, const threadresource& projected, flag_summary flags);
+
 }  // namespace culling

@@ -36,6 +36,7 @@ class face_drawer {
     read_arrays();
     if constexpr (COLOUR) prefetch_normals();
     culling::find_visible({fa, fb, fc}, mesh.facecount, resource, flags, visible);
+    if constexpr (DEPTH) covered = culling::is_covered(mesh.meshvertexcount, resource, flags);
     if (!mesh.hasalpha) {
       draw_visible();
     } else {
@@ -152,7 +153,7 @@ class face_drawer {
       const bool textured = texture != nullptr && texture->texels != nullptr;
       const bool translucent = transparency != 0;
       if (textured && (translucent || texture->alpha_kind == blending_texture)) mesh.hasalpha = true;
-      if (DEPTH && IsHidden(triangle)) return;
+      if (DEPTH && (covered ? StaysInBox(triangle) : IsHidden(triangle))) return;
       if (type > FT_FLAT || (texture != nullptr && texture->lighting_kind == unlit_material)) {
         set_colours(SSEMath::widen_shifted(colours_of(f)));
       } else {
@@ -299,6 +300,7 @@ class face_drawer {
 
   Rasterizer_n::Triangle_s triangle;
   culling::face_set visible;
+  bool covered = false;  // the whole model lies behind what is drawn, but for what leaves its box
 };
 
 template <bool POINTLIT, bool DISTANCEFOG, bool HEIGHTFOG, bool COLOUR, bool DEPTH>

@@ -1,14 +1,26 @@
-// Finding triangles that lie behind what is drawn already, before they are lit and set up.
+// Finding what lies behind all that is drawn already, before it is lit and set up.
 #pragma once
 
+#include "maths/Vector4.h"
 #include "raster/Triangle.h"
 
 namespace Rasterizer_n {
 
-// True if no pixel of the triangle would pass the depth test against what the depth target holds now: drawing it with
-// depth test would change nothing. Reads its vertices alone. False says nothing: large, narrow and odd triangles are
-// not looked at, and of the others the whole bounding box must lie nearer than the nearest vertex. Needs a depth
+// The lowest and the highest screen x, screen y and depth of some points; w is not read.
+struct ScreenBox_s {
+  Vector4_s low, high;
+};
+
+// True if everything in the box lies behind what the depth target holds there. False says nothing. Needs a depth
 // target.
+bool IsCovered(const ScreenBox_s& box);
+
+// True if the pixels of a triangle and their depths stay in the box of its vertices, as far as IsCovered looks at it.
+// Approximate slopes can leave it: large, narrow and odd triangles give false.
+bool StaysInBox(const Triangle_s& triangle);
+
+// True if drawing the triangle with depth test would change nothing: it stays in the box of its vertices, and that is
+// covered. Reads its vertices alone.
 bool IsHidden(const Triangle_s& triangle);
 
 }  // namespace Rasterizer_n

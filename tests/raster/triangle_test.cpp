@@ -388,8 +388,11 @@ TEST_F(TriangleTest, HiddenTrianglesDrawNothing) {
       };
       fill(random.one_in(4) ? std::nextafter(nearest, -1.0f) : nearest - 1.1e-5f * farthest);
       if (way == 1) target.depth.at(random.between(x0, x1 - 1), random.between(y0, y1 - 1)) = far_depth;
-      if (IsHidden(t)) {
-        ++hidden[way];
+      const ScreenBox_s box{{left, top, nearest, 0}, {right, bottom, farthest, 0}};
+      const bool found = IsHidden(t);
+      EXPECT_TRUE(!found || StaysInBox(t)) << "triangle " << n;
+      hidden[way] += found;
+      if (found || (StaysInBox(t) && IsCovered(box))) {
         render(smooth, t);
         const int end = std::min(columns, x1 + 8);
         for (int y = 0; y < rows; ++y) {
@@ -406,6 +409,34 @@ TEST_F(TriangleTest, HiddenTrianglesDrawNothing) {
   }
   EXPECT_GT(hidden[0], 0.1 * all);
   EXPECT_GT(hidden[2], 0.7 * all) << "three in four backgrounds are near enough";
+}
+
+TEST_F(TriangleTest, CoveredBoxesHaveNoHole) {
+  constexpr int columns = 301, rows = 280;
+  target = {columns, rows};
+  target.select(smooth);
+  SetViewport({0, 0, columns, rows, 0, 1});
+  SetCliprect({0, 0, columns, rows});
+  test_random random(4);
+  int covered = 0, solid = 0;
+  for (int n = 0; n < 2000; ++n) {
+    const int sides[] = {5, 9, 70, 256};
+    const int side = sides[random.between(0, 3)];
+    const float x = random.real(-20, 250), y = random.real(-20, 250);
+    const ScreenBox_s box{{x, y, 0.5f, 0}, {x + random.real(0, side), y + random.real(0, side), 0.75f, 0}};
+    const auto at = [](float f, int end) { return std::clamp(static_cast<int>(std::nearbyint(f)), 0, end); };
+    const int x0 = at(box.low.x, columns), x1 = at(box.high.x, columns);
+    const int y0 = at(box.low.y - 0.5f, rows), y1 = at(box.high.y - 0.5f, rows);
+    target.depth.fill(0.4999f);
+    if (x0 < x1 && y0 < y1 && random.one_in(2)) {
+      target.depth.at(random.between(x0, x1 - 1), random.between(y0, y1 - 1)) = random.one_in(2) ? 0.5f : NAN;
+      EXPECT_FALSE(IsCovered(box)) << n;
+    } else if (x1 >= 4) {
+      ++solid;
+      covered += IsCovered(box);
+    }
+  }
+  EXPECT_GT(covered, 0.7 * solid) << "the middle of others lies outside";
 }
 
 // --- Threads --------------------------------------------------------------------------------------------------------
