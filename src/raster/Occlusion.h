@@ -20,7 +20,8 @@ bool IsCovered(const ScreenBox_s& box);
 bool StaysInBox(const Triangle_s& triangle);
 
 // True if drawing the triangle with depth test would change nothing: it stays in the box of its vertices, and that is
-// covered. Reads its vertices alone.
+// covered. Reads its vertices alone. Another thread may be drawing to pixels of the box that are not the triangle's:
+// whatever is read there, the answer is right.
 bool IsHidden(const Triangle_s& triangle);
 
 }  // namespace Rasterizer_n

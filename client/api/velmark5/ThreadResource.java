@@ -24,6 +24,8 @@ public interface ThreadResource extends AutoCloseable {
    * <p>A model is in the distance fog as a whole or not at all: when an end of its upright axis lies beyond where the
    * fog begins. Its light is that of its mesh as it was built: the matrix does not turn the sun's effect along.
    *
+   * <p>Draw the nearest models first: with a depth buffer, what they hide costs a fraction of what shows.
+   *
    * @param model the model, whose pool is open
    * @param matrix from the model to the world
    * @throws IllegalStateException if the model or its pool is closed
