@@ -70,8 +70,8 @@ void model::render(threadresource& resource, const Matrix_c& world_matrix, copie
   const int half_width =
       screen_radius(scene, first_deeper ? world0 : world1, first_deeper ? screen0.x : screen1.x, radius);
   const auto half = static_cast<float>(half_width);
-  Rasterizer_n::PrefetchTargets(std::min(screen0.x, screen1.x) - half, std::min(screen0.y, screen1.y),
-                                std::max(screen0.x, screen1.x) + half, std::max(screen0.y, screen1.y));
+  Rasterizer_n::PrefetchDepth(std::min(screen0.x, screen1.x) - half, std::min(screen0.y, screen1.y),
+                              std::max(screen0.x, screen1.x) + half, std::max(screen0.y, screen1.y));
   if (result.elements != nullptr) {
     result.elements[0] = truncated(screen0.x);
     result.elements[1] = truncated(screen0.y);

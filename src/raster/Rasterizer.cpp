@@ -81,21 +81,17 @@ Vector4_s FogColour(unsigned int colour) {
   return {channel(0), channel(1), channel(2), channel(3)};
 }
 
-void PrefetchTargets(float left, float top, float right, float bottom) {
-  constexpr int line = 64 / 4, largest = 1 << 14;  // pixels
+void PrefetchDepth(float left, float top, float right, float bottom) {
+  constexpr int line = 64 / sizeof(float), largest = 1 << 14;  // pixels
   using namespace SSEMath;
+  if (m_pDepthBuffer == nullptr) return;
   const int x0 = std::max(truncate(left), m_ClipBox.left), x1 = std::min(truncate(right), m_ClipBox.right);
   const int y0 = std::max(truncate(top), m_ClipBox.top), y1 = std::min(truncate(bottom), m_ClipBox.bottom);
   if (x0 >= x1 || y0 >= y1 || (std::int64_t{x1} - x0) * (std::int64_t{y1} - y0) > largest) return;
-  const auto ask = [=](const auto* target, int y) {
-    if (target == nullptr) return;
-    const auto* const row = target + std::ptrdiff_t{y} * m_ScreenPitch;
+  const float* row = m_pDepthBuffer + std::ptrdiff_t{y0} * m_ScreenPitch;
+  for (int y = y0; y < y1; ++y, row += m_ScreenPitch) {
     for (int x = x0; x < x1; x += line) prefetch_nearer(row + x);
     prefetch_nearer(row + x1 - 1);
-  };
-  for (int y = y0; y < y1; ++y) {
-    ask(m_pDepthBuffer, y);
-    ask(m_pColourBuffer, y);
   }
 }
 

@@ -73,10 +73,10 @@ void RecomputeDistanceFogParams(float start, unsigned int colour);
 
 void SetZWrite(bool enable);
 
-// Asks for a small part of both targets before it is tested and drawn to, so that it is near by then: columns left to
-// right and rows top to bottom, in pixels, as far as they lie in the clip box. A large part is not asked for: it would
-// push out what is near.
-void PrefetchTargets(float left, float top, float right, float bottom);
+// Asks for a small part of the depth target before it is tested or drawn to, so that it is near by then: columns left
+// to right and rows top to bottom, in pixels, as far as they lie in the clip box. A large part is not asked for: it
+// would push out what is near.
+void PrefetchDepth(float left, float top, float right, float bottom);
 
 // The four bytes of a colour word, lowest first, each times 256.
 Vector4_s FogColour(unsigned int colour);
