@@ -546,7 +546,7 @@ const bool registered = [] {
     for (const int bits : {128, 256}) {
       add(
           scene + "llvmpipe" + std::to_string(bits), [=](benchmark::State& s) { scene_with_mesa(s, drawn, bits, 0); },
-          4);
+          10);
     }
   }
   add(
