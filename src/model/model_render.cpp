@@ -35,7 +35,7 @@ int screen_radius(const toolkit& scene, const Vector4_s& end, float end_screen_x
   const Float4 moved = Rasterizer_n::Transform(scene.viewprojection, end.x + camera.rows[0].x * radius,
                                                end.y + camera.rows[1].x * radius, end.z + camera.rows[2].x * radius);
   const int distance = rounded(SSEMath::lane0(Rasterizer_n::ToScreen(moved)) - end_screen_x);
-  return distance < 0 ? -distance : distance;
+  return distance < 0 ? SSEMath::wrapping_subtract(0, distance) : distance;
 }
 
 // A light's position relative to the model, turned by the transposed rotation of its matrix.

@@ -23,7 +23,9 @@ constexpr int last_pixel = 65536;
 alignas(16) constexpr float to_first[4] = {-0.25f, -0.52f, 0, 0}, to_last[4] = {0.25f, -0.48f, 0, 0};
 
 // How far a depth can fall below the nearest vertex, in parts of the largest: it is a sum of some 50 terms.
+// Depths so small that such a part is lost count as larger ones.
 alignas(16) constexpr float depth_slack[4] = {1e-5f, 1e-5f, 1e-5f, 1e-5f};
+constexpr float least_depth = 1e-30f;
 
 struct Box {
   Float4 low, high;
@@ -70,7 +72,8 @@ VELMARK5_LANE bool is_covered(const Box& box) {
   alignas(16) static constexpr std::uint32_t lane_numbers[4] = {0, 1, 2, 3};
   const int right_group = right - 4, left_group = std::min(left, right_group);
   const Int4 outside = less(load(lane_numbers), splat(static_cast<std::uint32_t>(left - left_group)));
-  const Float4 limit = broadcast<2>(box.low - max(magnitude(box.low), magnitude(box.high)) * load(depth_slack));
+  const Float4 largest = max(max(magnitude(box.low), magnitude(box.high)), splat(least_depth));
+  const Float4 limit = broadcast<2>(box.low - largest * load(depth_slack));
   const auto nearer = [limit](const float* depths) { return less(load_unaligned(depths), limit); };
   const float* row = depth_row(top);
   const float* const last_row = depth_row(bottom - 1);

@@ -337,7 +337,8 @@ TEST_F(TriangleTest, RowsAndSpansEndWhereTheyShould) {
 // hardly change.
 Triangle_s small_triangle(test_random& random, float x, float y) {
   const float sizes[] = {1, 3, 8, 16, 31, 40};
-  const float size = sizes[random.between(0, 5)], depth = std::ldexp(1.0f, -random.between(0, 12));
+  const float size = sizes[random.between(0, 5)];
+  const float depth = std::ldexp(1.0f, random.one_in(16) ? -144 : -random.between(0, 12));
   Triangle_s t{};
   for (VertexColour_s& colour : t.colour) std::fill_n(colour.channels, 4, std::uint16_t{0xFFFF});
   for (Vector4_s& v : t.vertex) {
@@ -408,7 +409,7 @@ TEST_F(TriangleTest, HiddenTrianglesDrawNothing) {
     all += std::abs(area) > 12 && right - left < 32 && bottom - top < 32 && left > 0 && right < columns && top > 0;
   }
   EXPECT_GT(hidden[0], 0.1 * all);
-  EXPECT_GT(hidden[2], 0.7 * all) << "three in four backgrounds are near enough";
+  EXPECT_GT(hidden[2], 0.65 * all) << "three in four backgrounds are near enough";
 }
 
 TEST_F(TriangleTest, CoveredBoxesHaveNoHole) {
