@@ -36,7 +36,7 @@ class face_drawer {
     read_arrays();
     if constexpr (COLOUR) prefetch_normals();
     culling::find_visible({fa, fb, fc}, mesh.facecount, resource, flags, visible);
-    if constexpr (DEPTH) covered = culling::is_covered(mesh.meshvertexcount, resource, flags);
+    if constexpr (COLOUR && DEPTH) covered = culling::is_covered(mesh.meshvertexcount, resource, flags);
     if (!mesh.hasalpha) {
       draw_visible();
     } else {
