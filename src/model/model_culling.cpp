@@ -182,10 +182,7 @@ bool is_covered(int count, const threadresource& projected, flag_summary flags) 
     const Float4 v = load(&vertices[i].x);
     low = min(low, v), high = max(high, v);
   }
-  Rasterizer_n::ScreenBox_s box;
-  store(&box.low.x, low);
-  store(&box.high.x, high);
-  return Rasterizer_n::IsCovered(box);
+  return Rasterizer_n::IsCovered({low, high});
 }
 
 }  // namespace culling

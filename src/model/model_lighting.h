@@ -37,7 +37,7 @@ struct corner_vectors {
 VELMARK5_LANE corner_vectors by_lane(const Vector4_s& v0, const Vector4_s& v1, const Vector4_s& v2) {
   using namespace SSEMath;
   const Float4 p = load(&v0.x), q = load(&v1.x), r = load(&v2.x);
-  const Float4 xy{_mm_unpacklo_ps(p.v, q.v)}, zw{_mm_unpackhi_ps(p.v, q.v)};
+  const Float4 xy = interleave_low(p, q), zw = interleave_high(p, q);
   return {shuffle<0, 1, 0, 0>(xy, r), shuffle<2, 3, 1, 1>(xy, r), shuffle<0, 1, 2, 2>(zw, r),
           shuffle<2, 3, 3, 3>(zw, r)};
 }

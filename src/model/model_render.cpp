@@ -19,7 +19,6 @@ Vector4_s stored(Float4 v) {
 
 float dot(const Vector4_s& p, const Vector4_s& q) { return p.x * q.x + p.y * q.y + p.z * q.z + p.w * q.w; }
 
-int truncated(float x) { return _mm_cvttss_si32(_mm_set_ss(x)); }
 int rounded(float x) { return _mm_cvtss_si32(_mm_set_ss(x)); }
 
 // True when some plane has both ends of a vertical capsule further outside than its radius.
@@ -73,10 +72,10 @@ void model::render(threadresource& resource, const Matrix_c& world_matrix, copie
   Rasterizer_n::PrefetchDepth(std::min(screen0.x, screen1.x) - half, std::min(screen0.y, screen1.y),
                               std::max(screen0.x, screen1.x) + half, std::max(screen0.y, screen1.y));
   if (result.elements != nullptr) {
-    result.elements[0] = truncated(screen0.x);
-    result.elements[1] = truncated(screen0.y);
-    result.elements[2] = truncated(screen1.x);
-    result.elements[3] = truncated(screen1.y);
+    result.elements[0] = SSEMath::truncate(screen0.x);
+    result.elements[1] = SSEMath::truncate(screen0.y);
+    result.elements[2] = SSEMath::truncate(screen1.x);
+    result.elements[3] = SSEMath::truncate(screen1.y);
     result.elements[4] = half_width;
     result.elements[5] = 1;
   }

@@ -5,7 +5,6 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "maths/SSEMath.h"
 #include "raster/Rasterizer.h"
 
 namespace Rasterizer_n {
@@ -27,13 +26,11 @@ alignas(16) constexpr float to_first[4] = {-0.25f, -0.52f, 0, 0}, to_last[4] = {
 alignas(16) constexpr float depth_slack[4] = {1e-5f, 1e-5f, 1e-5f, 1e-5f};
 constexpr float least_depth = 1e-30f;
 
-struct Box {
-  Float4 low, high;
-};
+VELMARK5_LANE ScreenBox_s box_of(Float4 a, Float4 b, Float4 c) { return {min(min(a, b), c), max(max(a, b), c)}; }
 
-VELMARK5_LANE Box box_of(Float4 a, Float4 b, Float4 c) { return {min(min(a, b), c), max(max(a, b), c)}; }
+VELMARK5_LANE float nearest_of(const ScreenBox_s& box) { return lane0(broadcast<2>(box.low)); }
 
-VELMARK5_LANE bool at_most(const Box& box, float side) {
+VELMARK5_LANE bool at_most(const ScreenBox_s& box, float side) {
   return (lane_bits(less_equal(box.high - box.low, splat(side))) & 3) == 3;
 }
 
@@ -59,7 +56,7 @@ VELMARK5_LANE bool is_nearer(Float4 point, float limit) {
   return x >= clip.left && x < clip.right && y >= clip.top && y < clip.bottom && depth_row(y)[x] < limit;
 }
 
-VELMARK5_LANE bool is_covered(const Box& box) {
+VELMARK5_LANE bool is_covered(const ScreenBox_s& box) {
   const ClipBox_s& clip = m_ClipBox;
   const Int4 first = round(box.low + load(to_first)), last = round(box.high + load(to_last));
   const int left = std::max(lane<0>(first), clip.left), right = std::min(lane<0>(last), clip.right);
@@ -100,10 +97,9 @@ VELMARK5_LANE bool is_covered(const Box& box) {
 
 }  // namespace
 
-bool IsCovered(const ScreenBox_s& screen) {
-  const Box box{load(&screen.low.x), load(&screen.high.x)};
+bool IsCovered(const ScreenBox_s& box) {
   // One pixel in the middle tells most boxes that show.
-  return is_nearer((box.low + box.high) * splat(0.5f), screen.low.z) && at_most(box, largest_box) && is_covered(box);
+  return is_nearer((box.low + box.high) * splat(0.5f), nearest_of(box)) && at_most(box, largest_box) && is_covered(box);
 }
 
 bool StaysInBox(const Triangle_s& triangle) {
@@ -114,8 +110,8 @@ bool StaysInBox(const Triangle_s& triangle) {
 
 bool IsHidden(const Triangle_s& triangle) {
   const Float4 a = load(&triangle.vertex[0].x), b = load(&triangle.vertex[1].x), c = load(&triangle.vertex[2].x);
-  const Box box = box_of(a, b, c);
-  return is_nearer((a + b + c) * splat(1.0f / 3), lane0(broadcast<2>(box.low))) && at_most(box, largest_triangle) &&
+  const ScreenBox_s box = box_of(a, b, c);
+  return is_nearer((a + b + c) * splat(1.0f / 3), nearest_of(box)) && at_most(box, largest_triangle) &&
          is_covered(box) && !is_sliver(a, b, c);
 }
 

@@ -1,14 +1,14 @@
 // Finding what lies behind all that is drawn already, before it is lit and set up.
 #pragma once
 
-#include "maths/Vector4.h"
+#include "maths/SSEMath.h"
 #include "raster/Triangle.h"
 
 namespace Rasterizer_n {
 
-// The lowest and the highest screen x, screen y and depth of some points; w is not read.
+// The lowest and the highest screen x, screen y and depth of some points, by lane; the last lane is not read.
 struct ScreenBox_s {
-  Vector4_s low, high;
+  SSEMath::Float4 low, high;
 };
 
 // True if everything in the box lies behind what the depth target holds there. False says nothing. Needs a depth

@@ -186,11 +186,15 @@ class TriangleTest : public testing::Test {
   Target target{width, height};
 
   void SetUp() override {
-    target.depth.fill(0.5f);
-    target.select(smooth);
-    SetViewport({0, 0, width, height, 0, 1});
-    SetCliprect({0, 0, width, height});
+    select(0.5f);
     RecomputeDistanceFogParams(0, 0);
+  }
+  // Makes the target, all of one depth, the one that is drawn to.
+  void select(float depth) {
+    target.depth.fill(depth);
+    target.select(smooth);
+    SetViewport({0, 0, target.depth.width, target.depth.height, 0, 1});
+    SetCliprect({0, 0, target.depth.width, target.depth.height});
   }
   void TearDown() override {
     m_pColourBuffer = nullptr;
@@ -365,10 +369,7 @@ Triangle_s small_triangle(test_random& random, float x, float y) {
 TEST_F(TriangleTest, HiddenTrianglesDrawNothing) {
   constexpr int columns = 65536, rows = 64;
   target = {columns, rows};
-  target.depth.fill(far_depth);
-  target.select(smooth);
-  SetViewport({0, 0, columns, rows, 0, 1});
-  SetCliprect({0, 0, columns, rows});
+  select(far_depth);
   test_random random(3);
   int hidden[3] = {}, all = 0;
   for (int n = 0; n < 100000; ++n) {
@@ -389,7 +390,7 @@ TEST_F(TriangleTest, HiddenTrianglesDrawNothing) {
       };
       fill(random.one_in(4) ? std::nextafter(nearest, -1.0f) : nearest - 1.1e-5f * farthest);
       if (way == 1) target.depth.at(random.between(x0, x1 - 1), random.between(y0, y1 - 1)) = far_depth;
-      const ScreenBox_s box{{left, top, nearest, 0}, {right, bottom, farthest, 0}};
+      const ScreenBox_s box{SSEMath::floats(left, top, nearest, 0), SSEMath::floats(right, bottom, farthest, 0)};
       const bool found = IsHidden(t);
       EXPECT_TRUE(!found || StaysInBox(t)) << "triangle " << n;
       hidden[way] += found;
@@ -415,19 +416,18 @@ TEST_F(TriangleTest, HiddenTrianglesDrawNothing) {
 TEST_F(TriangleTest, CoveredBoxesHaveNoHole) {
   constexpr int columns = 301, rows = 280;
   target = {columns, rows};
-  target.select(smooth);
-  SetViewport({0, 0, columns, rows, 0, 1});
-  SetCliprect({0, 0, columns, rows});
+  select(far_depth);
   test_random random(4);
   int covered = 0, solid = 0;
   for (int n = 0; n < 2000; ++n) {
     const int sides[] = {5, 9, 70, 256};
     const int side = sides[random.between(0, 3)];
-    const float x = random.real(-20, 250), y = random.real(-20, 250);
-    const ScreenBox_s box{{x, y, 0.5f, 0}, {x + random.real(0, side), y + random.real(0, side), 0.75f, 0}};
+    const float left = random.real(-20, 250), top = random.real(-20, 250);
+    const float right = left + random.real(0, side), bottom = top + random.real(0, side);
+    const ScreenBox_s box{SSEMath::floats(left, top, 0.5f, 0), SSEMath::floats(right, bottom, 0.75f, 0)};
     const auto at = [](float f, int end) { return std::clamp(static_cast<int>(std::nearbyint(f)), 0, end); };
-    const int x0 = at(box.low.x, columns), x1 = at(box.high.x, columns);
-    const int y0 = at(box.low.y - 0.5f, rows), y1 = at(box.high.y - 0.5f, rows);
+    const int x0 = at(left, columns), x1 = at(right, columns);
+    const int y0 = at(top - 0.5f, rows), y1 = at(bottom - 0.5f, rows);
     target.depth.fill(0.4999f);
     if (x0 < x1 && y0 < y1 && random.one_in(2)) {
       target.depth.at(random.between(x0, x1 - 1), random.between(y0, y1 - 1)) = random.one_in(2) ? 0.5f : NAN;
